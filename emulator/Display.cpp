@@ -1,0 +1,117 @@
+#include "Display.h"
+
+namespace emulator {
+
+namespace {
+
+constexpr int positions = Display::rowCount * Display::columns;
+
+constexpr unsigned char commandPrefix = 0xFE;
+
+enum Command : unsigned char {
+    noOperation = 0x00,
+    clearDisplay = 0x01,
+    cursorHome = 0x02,
+    readKey = 0x06,
+    cursorOff = 0x0C,
+    cursorBlink = 0x0D,
+    cursorLeft = 0x10,
+    cursorRight = 0x14,
+    functionSet = 0x28,
+    row1Address = 0x40,
+    row0Address = 0x80,
+};
+
+} // namespace
+
+Display::Display() {
+    clear();
+}
+
+bool Display::receive(unsigned char byte) {
+    if (byte == commandPrefix) {
+        // A prefix behind a prefix: the command between them was lost.
+        if (commandFollows_)
+            unknownCommands_++;
+        commandFollows_ = true;
+        return false;
+    }
+    if (!commandFollows_) {
+        write(byte);
+        return false;
+    }
+    commandFollows_ = false;
+    return execute(byte);
+}
+
+std::string Display::visibleRow(int row) const {
+    return wholeRow(row).substr(0, visibleColumns);
+}
+
+std::string Display::wholeRow(int row) const {
+    return rows_.at(static_cast<std::size_t>(row));
+}
+
+int Display::cursorRow() const {
+    return position_ / columns;
+}
+
+int Display::cursorColumn() const {
+    return position_ % columns;
+}
+
+bool Display::execute(unsigned char command) {
+    switch (command) {
+    case noOperation:
+    case functionSet:
+        return false;
+    case clearDisplay:
+        clear();
+        return false;
+    case cursorHome:
+        position_ = 0;
+        return false;
+    case cursorOff:
+        blinking_ = false;
+        return false;
+    case cursorBlink:
+        blinking_ = true;
+        return false;
+    case cursorLeft:
+        position_ = (position_ + positions - 1) % positions;
+        return false;
+    case cursorRight:
+        position_ = (position_ + 1) % positions;
+        return false;
+    case readKey:
+        return true;
+    default:
+        break;
+    }
+    // Address 68 hex lies one past row 1's end. The counter takes it as it takes running past
+    // 67 hex, starting over at 00, so that a step to the left from it is row 1's last column.
+    if (command >= row1Address && command <= row1Address + columns) {
+        position_ = (columns + command - row1Address) % positions;
+    } else if (command >= row0Address && command < row0Address + columns) {
+        position_ = command - row0Address;
+    } else {
+        unknownCommands_++;
+    }
+    return false;
+}
+
+void Display::write(unsigned char character) {
+    const int column = cursorColumn();
+    if (column >= visibleColumns)
+        hiddenCharacters_++;
+    rows_.at(static_cast<std::size_t>(cursorRow())).at(static_cast<std::size_t>(column)) =
+        static_cast<char>(character);
+    position_ = (position_ + 1) % positions;
+}
+
+void Display::clear() {
+    rows_.fill(std::string(columns, ' '));
+    position_ = 0;
+}
+
+} // namespace emulator
