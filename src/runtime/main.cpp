@@ -1,0 +1,7 @@
+#include "runtime/MainLoop.h"
+
+int main() {
+    MainLoop loop;
+    for (;;)
+        loop.turn();
+}

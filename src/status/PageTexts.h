@@ -1,0 +1,18 @@
+// The texts of the status pages: two lines, separated by a line feed, computed afresh at each call.
+#pragma once
+
+#include "status/PlatformCode.h"
+
+#include <string>
+
+/// The banner of the model; empty for an unknown one.
+std::string productText(PlatformCode platform);
+
+std::string hostnameText();
+
+/// Which management server the appliance is connected to. Any file that is missing or does not say
+/// so reads as no server.
+std::string connectionText();
+
+/// A port's label and name, and its address or the reason why there is none.
+std::string interfaceText(const std::string &name);
