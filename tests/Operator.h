@@ -1,0 +1,36 @@
+// An operator at the rack, in virtual time: presses keys, waits, and reads the two rows.
+#pragma once
+
+#include "World.h"
+
+#include "runtime/KeyCode.h"
+#include "runtime/MainLoop.h"
+
+#include <gtest/gtest.h>
+
+/// The appliance that most tests start from: a hardware model with one configured port.
+void standardAppliance(World &appliance);
+
+class Operator {
+  public:
+    /// Starts the program on the world as it is now.
+    Operator() = default;
+
+    void poll(KeyCode key = keyNone);           ///< one turn, with this key down or none
+    void hold(KeyCode key, int polls);          ///< that many turns with the key down, then release
+    void press(KeyCode key, int times = 1);     ///< as short as the keypad can tell, then released
+    void answer(const std::string &bytes);      ///< one turn in which the panel sends just these
+    void wait(double seconds);                  ///< turns without a key
+    void waitForPage(const std::string &title); ///< until row 0 begins with this; fails in the end
+
+    /// Both rows without the blanks at their ends, as "row 0|row 1".
+    static std::string sees();
+    /// Where the cursor blinks, as "row,column", or "off".
+    static std::string cursor();
+
+  private:
+    MainLoop loop;
+};
+
+/// Runs a check in a process of its own, so that it meets a program that has just been started.
+void inFreshProgram(const std::function<void()> &check);

@@ -1,0 +1,194 @@
+#include "Operator.h"
+
+#include "runtime/LcdPanel.h"
+#include "runtime/runCommand.h"
+#include "runtime/splitString.h"
+
+#include <csignal>
+
+namespace {
+
+std::string sentBy(const std::function<void(LcdPanel &)> &action) {
+    world().sent.clear();
+    action(*LcdPanel::instance());
+    return world().sent;
+}
+
+} // namespace
+
+TEST(Runtime, TheLineIsConfiguredAndThePanelClearedBeforeMain) {
+    EXPECT_EQ(world().sent, "\xFE\x28\xFE\x28\xFE\x01\xFE\x02");
+    EXPECT_EQ(world().writes, std::vector<std::size_t>(8, 1));
+    const std::vector<std::string> settings = {
+        "stty ispeed 2400 < /dev/ttyS1",
+        "stty raw < /dev/ttyS1",
+        "stty -F /dev/ttyS1 -ignbrk -brkint -parmrk -inpck -istrip -inlcr -igncr -icrnl -iuclc "
+        "-ixon -ixany -ixoff -imaxbel ignpar",
+        "stty -F /dev/ttyS1 -opost -olcuc -onlcr -ocrnl -onocr -onlret -ofill -ofdel nl0 cr0 tab0 "
+        "bs0 vt0 ff0",
+        "stty -F /dev/ttyS1 -parenb -crtscts -parodd -hupcl cread cs8 cstopb clocal",
+        "stty -F /dev/ttyS1 -isig -icanon -iexten -echo noflsh"};
+    EXPECT_EQ(world().settings, settings);
+}
+
+TEST(Runtime, AKeyIsHeldShortOnPollsTwoToFiveAndLongFromTheSixth) {
+    LcdPanel &panel = *LcdPanel::instance();
+    for (const KeyCode key : {keyUp, keyDown, keyEnter, keyEscape}) {
+        for (int poll = 1; poll <= 8; ++poll) {
+            panel.countKey(key);
+            EXPECT_EQ(panel.isHeldShort(key), poll >= 2 && poll <= 5) << key << " " << poll;
+            EXPECT_EQ(panel.isHeldLong(key), poll > 5) << key << " " << poll;
+            for (KeyCode other = 0; other <= 5; ++other) {
+                if (other == key)
+                    continue;
+                EXPECT_FALSE(panel.isHeldShort(other) || panel.isHeldLong(other));
+            }
+        }
+    }
+    panel.countKey(keyNone);
+    EXPECT_FALSE(isHeld(&panel, keyEscape));
+}
+
+TEST(Runtime, AnAnswerIsReadFromItsSecondByteAndAnythingElseEndsTheHold) {
+    struct Case {
+        std::string answer;
+        KeyCode key;
+    };
+    const std::vector<Case> cases = {
+        {"\x80\xBE", keyUp},
+        {std::string("\0\xBD", 2), keyDown},
+        {"\xBE\xBB", keyEnter},
+        {"\x80\xB7\x80\xBE\x80\xBE", keyEscape}, // a backlog is one key
+        {std::string("\x80\xBE") + std::string(300, '\xBD'), keyUp},
+        {"\x80\xB8", keyNone},
+        {"\xBE", keyNone},
+        {"", keyNone},
+    };
+    LcdPanel &panel = *LcdPanel::instance();
+    for (const auto &[answer, key] : cases) {
+        panel.countKey(keyUp);
+        panel.countKey(keyUp);
+        world().answers = {answer.substr(0, 255)};
+        EXPECT_EQ(panel.pollKey(), key);
+        EXPECT_EQ(panel.isHeldShort(keyUp), key == keyUp);
+    }
+}
+
+TEST(Runtime, CommandsAreTwoSingleBytesAndTheCursorGoesWhereItIsSent) {
+    const auto cursorAt = [](int row, int column) {
+        return sentBy([&](LcdPanel &panel) { panel.setCursor(row, column); });
+    };
+    EXPECT_EQ(cursorAt(0, 45), "\xFE\xA7");
+    EXPECT_EQ(cursorAt(1, 0), "\xFE\x41\xFE\x10");
+    EXPECT_EQ(cursorAt(0, -1), "\xFE\x7F");
+    EXPECT_EQ(cursorAt(2, 0), "");
+    for (int column = 0; column < 40; ++column) {
+        cursorAt(1, column);
+        EXPECT_EQ(world().display.cursorRow(), 1);
+        EXPECT_EQ(world().display.cursorColumn(), column);
+    }
+    world().writes.clear();
+    LcdPanel::instance()->clear();
+    EXPECT_EQ(world().writes, std::vector<std::size_t>(4, 1));
+    world().lineTakesBytes = false;
+    EXPECT_EQ(LcdPanel::instance()->sendCommand(0x01), -1);
+}
+
+TEST(Runtime, ATextIsTwoRowsOfSixteenAndTheRestIsDroppedOrScrolled) {
+    struct Case {
+        std::string text, rows;
+        int left;
+    };
+    const std::vector<Case> cases = {
+        {"", "|", 0},
+        {"one", "one|", 0},
+        {"Error\nInvalid Hostname", "Error|Invalid Hostname", 0},
+        {"\nsecond\nthird", "|second", 0},
+        {"a row too long by far\n12345678901234567890", "a row too long b|1234567890123456", 4},
+    };
+    LcdPanel &panel = *LcdPanel::instance();
+    for (const auto &[text, rows, left] : cases) {
+        world().writes.clear();
+        EXPECT_EQ(panel.showText(text), left);
+        EXPECT_EQ(Operator::sees(), rows);
+        EXPECT_EQ(world().writes, (std::vector<std::size_t>{1, 1, 1, 1, 16, 1, 1, 1, 1, 16}));
+    }
+    EXPECT_EQ(world().display.hiddenCharacters(), 0U);
+}
+
+TEST(Runtime, TheMarqueeGoesRoundBothWaysAndShortTextsLeaveTheRestOfTheRow) {
+    LcdPanel &panel = *LcdPanel::instance();
+    const std::string name = "abcdefghijklmnopqrst"; // 20 characters
+    const std::string cycle = name + "   " + name;
+    panel.showText("Title\n" + name);
+    for (std::size_t step = 1; step <= 23; ++step) {
+        panel.scrollMarqueeForward();
+        EXPECT_EQ(world().display.visibleRow(1), cycle.substr(step % 23, 16));
+        EXPECT_EQ(world().display.cursorColumn(), 15);
+    }
+    panel.scrollMarqueeBackward();
+    EXPECT_EQ(world().display.visibleRow(1), " abcdefghijklmno");
+    EXPECT_EQ(world().display.visibleRow(0), "Title           ");
+
+    panel.showText("\n12345");
+    panel.setMarqueeText("abc");
+    EXPECT_EQ(sentBy([](LcdPanel &same) { same.scrollMarqueeForward(); }), "\xFE\x41\xFE\x10"
+                                                                           "bc   abc\xFE\x10");
+    panel.resetMarquee();
+    for (const std::size_t width : {2U, 1U, 3U, 2U}) {
+        EXPECT_EQ(sentBy([](LcdPanel &same) { same.scrollMarqueeForward(); }).length(), 6 + width);
+    }
+}
+
+TEST(Runtime, SplittingKeepsEmptyPiecesButForTheLast) {
+    using Pieces = std::vector<QLX::String<char>>;
+    EXPECT_EQ(splitString("x\ny\n ", "\n"), (Pieces{"x", "y", " "}));
+    EXPECT_EQ(splitString("\nx", "\n"), (Pieces{"", "x"}));
+    EXPECT_EQ(splitString("x\n\ny", "\n"), (Pieces{"x", "", "y"}));
+    EXPECT_EQ(splitString("x,", ","), (Pieces{"x"}));
+    EXPECT_EQ(splitString("aaab", "aa"), (Pieces{"", "ab"}));
+    EXPECT_EQ(splitString("", ","), (Pieces{""}));
+    EXPECT_EQ(splitString("x,y", ""), (Pieces{"x,y"}));
+}
+
+TEST(Runtime, AllOutputIsCapturedAndBackgroundCommandsAreNotWaitedFor) {
+    const std::string longLine(1000, 'x');
+    world().outputs = {{"many", "a\n" + longLine + "\n\nno end"}, {"none", ""}};
+    EXPECT_EQ(runCommand("many", true), "a\n" + longLine + "\n\nno end");
+    EXPECT_EQ(runCommand("none", true), "");
+    EXPECT_EQ(runCommand("later", false), "");
+    EXPECT_EQ(world().commands("start"), std::vector<std::string>{"`later` &"});
+    world().shellWorks = false;
+    EXPECT_EQ(runCommand("many", true), "ERROR");
+}
+
+TEST(Runtime, ASignalAtAnyTimeRefreshesThePagesAndEndsAHold) {
+    const auto interrupt = [] { raise(SIGUSR1); };
+    standardAppliance(world());
+    world().duringCommand = interrupt; // while the main menu is being built
+    Operator person;
+    const auto listings = [] { return world().commands("run echo").size(); };
+    EXPECT_EQ(listings(), 1U);
+    person.poll();
+    EXPECT_EQ(listings(), 2U);
+
+    world().duringPause = interrupt;
+    person.poll();
+    person.press(keyDown);
+    EXPECT_EQ(listings(), 3U);
+    EXPECT_EQ(Operator::sees(), "Kestrova (TM)|cabinetDevice");
+
+    person.poll(keyDown);
+    EXPECT_EQ(Operator::sees(), "Hostname:|monitor");
+    world().duringPoll = interrupt;
+    person.poll(); // no key, and a new start at the first page
+    EXPECT_EQ(Operator::sees(), "Kestrova (TM)|cabinetDevice");
+    person.poll(keyDown); // the key never left the keypad, yet counts as pressed again
+    EXPECT_EQ(Operator::sees(), "Hostname:|monitor");
+
+    world().duringCommand = interrupt; // during a rebuild: asks for another one
+    raise(SIGUSR1);
+    person.poll();
+    person.poll();
+    EXPECT_EQ(listings(), 6U);
+}
