@@ -9,10 +9,6 @@
 
 namespace {
 
-// Built before `main`: a line that cannot be configured ends the process before anything is drawn
-// or any signal handled.
-LcdPanel *const panelAtStart = LcdPanel::instance();
-
 constexpr useconds_t turnPauseUs = 100000;
 
 // The request is a flag that needs no object: the signal may come before the main menu exists, or
@@ -25,7 +21,7 @@ void requestRefresh(int) {
 
 MainLoop::MainLoop() {
     signal(SIGUSR1, requestRefresh);
-    panel = panelAtStart;
+    panel = LcdPanel::instance(); // opened long since, by an initialiser
     context = new MenuContext(MainMenu::instance());
 }
 

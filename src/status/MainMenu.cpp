@@ -1,5 +1,6 @@
 #include "status/MainMenu.h"
 
+#include "netconfig/IfaceTypeMenu.h"
 #include "runtime/LcdPanel.h"
 #include "runtime/beginsWith.h"
 #include "status/Interfaces.h"
@@ -139,4 +140,23 @@ void MainMenu::onEscape(MenuContext *) {
     pageInterval = autoPageInterval;
 }
 
-void MainMenu::onEnter(MenuContext *) {}
+void MainMenu::onEnter(MenuContext *context) {
+    if (panel->isHeldLong(keyEnter))
+        return;
+    const std::string name = *currentPage;
+    if (isEthernet(name)) {
+        IfaceTypeMenu::instance()->selectInterface(name);
+        enterSubmenu(context, IfaceTypeMenu::instance());
+    }
+}
+
+// One page back, so that the operator's return advances to the page that was left and shows it
+// afresh.
+void MainMenu::enterSubmenu(MenuContext *context, Menu *menu) {
+    lastPageChange = ACE_Time_Value();
+    lastScroll = ACE_Time_Value();
+    scrollInterval = firstScrollDelay;
+    scrollSteps = 0;
+    previousPage();
+    setMenu(context, menu);
+}

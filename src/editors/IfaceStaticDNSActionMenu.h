@@ -1,0 +1,35 @@
+#pragma once
+
+#include "editors/EditedAddress.h"
+#include "runtime/Menu.h"
+
+/// Asks whether a DNS server is to be edited or deleted. A deletion is not asked about again.
+class IfaceStaticDNSActionMenu : public Menu {
+  public:
+    static IfaceStaticDNSActionMenu *instance();
+
+    /// Not owned. To be called before the screen is made current.
+    void setConfig(NetworkConfig *settings) { config = settings; }
+    /// Position of the server to be acted on.
+    void setServerIndex(ServerIndex index) { serverIndex = index; }
+
+    void display(MenuContext *context) override;
+    void onUp(MenuContext *context) override;
+    void onDown(MenuContext *context) override;
+    void onEscape(MenuContext *context) override;
+    void onEnter(MenuContext *context) override;
+
+  private:
+    IfaceStaticDNSActionMenu() = default;
+
+    void select(bool deletion);
+    Menu *deleteServer();
+    Menu *editServer();
+
+    bool drawn = false;
+    NetworkConfig *config = nullptr;
+    ServerIndex serverIndex = noServer;
+    bool deleteSelected = false;
+
+    static IfaceStaticDNSActionMenu *theInstance;
+};

@@ -1,0 +1,26 @@
+#pragma once
+
+#include "editors/AddressEditor.h"
+#include "runtime/Menu.h"
+
+/// Edits the address of the port in work.
+class IfaceStaticEditIPMenu : public Menu {
+  public:
+    static IfaceStaticEditIPMenu *instance();
+
+    /// Not owned. To be called before the screen is made current.
+    void setConfig(NetworkConfig *settings) { editor.setConfig(settings); }
+
+    void display(MenuContext *context) override;
+    void onUp(MenuContext *context) override;
+    void onDown(MenuContext *context) override;
+    void onEscape(MenuContext *context) override;
+    void onEnter(MenuContext *context) override;
+
+  private:
+    IfaceStaticEditIPMenu() = default;
+
+    AddressEditor editor;
+
+    static IfaceStaticEditIPMenu *theInstance;
+};

@@ -1,0 +1,27 @@
+#pragma once
+
+#include "runtime/Menu.h"
+
+class NetworkConfig;
+
+/// Asks for confirmation before a port is switched to DHCP. Whatever comes of it, the panel goes
+/// back to the status pages: there the port shows whether it got an address.
+class IfaceDHCPApplyMenu : public Menu {
+  public:
+    static IfaceDHCPApplyMenu *instance();
+
+    /// Not owned. To be called before the screen is made current.
+    void setConfig(NetworkConfig *settings) { config = settings; }
+
+    void display(MenuContext *context) override;
+    void onEscape(MenuContext *context) override;
+    void onEnter(MenuContext *context) override;
+
+  private:
+    IfaceDHCPApplyMenu() = default;
+
+    bool drawn = false;
+    NetworkConfig *config = nullptr;
+
+    static IfaceDHCPApplyMenu *theInstance;
+};
