@@ -1,0 +1,53 @@
+#pragma once
+
+#include "Key.h"
+
+#include <functional>
+#include <optional>
+
+namespace emulator {
+
+/// The panel's four keys, of which one is down at a time, and its answers to key requests.
+///
+/// A request is answered while a key is down. Without one it waits for a key to go down; the next
+/// request takes its place. The panel never answers that no key is down.
+class Keypad {
+  public:
+    using Send = std::function<void(Key)>;
+
+    /// `send` is called with the key for each answer.
+    explicit Keypad(Send send) : send_(std::move(send)) {}
+
+    /// Puts a key down until `release`. A key that was down comes up.
+    void press(Key key);
+    void release();
+    /// Puts a key down for exactly one answer.
+    void tap(Key key);
+
+    /// The program asked for a key. `sinceAnswerRead` tells whether it did so after it had read
+    /// the last answer: a request that it had given up by then may still be answered, and the
+    /// answer is read by its next poll, whose request was on the line already.
+    void request(bool sinceAnswerRead);
+
+    [[nodiscard]] std::optional<Key> down() const { return down_; }
+    /// Requests answered so far.
+    [[nodiscard]] unsigned long answered() const { return answered_; }
+    /// True when no key is down and, since the last answer was read, a whole poll has gone by
+    /// without one: only then does the program take the next answer for a new press.
+    [[nodiscard]] bool settled() const { return !down_ && quietRequests_ >= wholePoll; }
+
+  private:
+    // A poll without a key is known to be over when the request of the next one comes.
+    static constexpr unsigned long wholePoll = 2;
+
+    void answer();
+
+    Send send_;
+    std::optional<Key> down_;
+    bool tapping_ = false;
+    bool waiting_ = false;
+    unsigned long answered_ = 0;
+    unsigned long quietRequests_ = wholePoll;
+};
+
+} // namespace emulator

@@ -1,0 +1,70 @@
+#pragma once
+
+#include "Clock.h"
+#include "FileDescriptor.h"
+
+#include <cstdint>
+#include <deque>
+#include <fstream>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace emulator {
+
+/// The serial line between the program and the panel: a pseudo-terminal of which the program
+/// opens the slave.
+///
+/// A pseudo-terminal delivers at once what a UART takes 4.58 ms a byte for. So bytes are collected
+/// when they arrive and given to the panel when the real line would have carried them. What waits
+/// is bounded as in a UART's buffer; beyond that the line is not read, and the program's writes
+/// fail in the end (the pseudo-terminal itself takes some 20,000 bytes more).
+class Line {
+  public:
+    struct Byte {
+        unsigned char value;
+        bool sinceAnswerRead; ///< sent after the program had read the last answer
+    };
+
+    /// Opens the pseudo-terminal, raw and at 2400 baud both ways. With `fast` bytes are not paced.
+    /// With `tracePath` every arrival and answer is written to that file. Throws on failure.
+    explicit Line(bool fast, const std::optional<std::string> &tracePath = std::nullopt);
+
+    /// The slave's path, for the program to open.
+    [[nodiscard]] const std::string &path() const { return path_; }
+    /// Readable when bytes have arrived; -1 while the backlog is full.
+    [[nodiscard]] int descriptor() const;
+
+    /// Takes in what has arrived.
+    void collect();
+    /// The next byte that the line has carried by `now`, if any.
+    std::optional<Byte> next(TimePoint now);
+    /// When `next` or `collect` should be called again even if nothing arrives, if ever.
+    [[nodiscard]] std::optional<TimePoint> wakeAt() const;
+
+    /// Answers a key request; both bytes in one write, as a UART's FIFO delivers them. An answer
+    /// that does not fit into what the program left unread is lost, as in an overrun.
+    void answer(unsigned char keyCode);
+
+  private:
+    struct Arrival {
+        unsigned char value;
+        TimePoint time;
+        std::uint64_t answersRead;
+    };
+
+    void trace(char direction, TimePoint time, const unsigned char *bytes, std::size_t count);
+
+    FileDescriptor master_;
+    FileDescriptor slave_; // held open so that settings outlive the program's own descriptors
+    std::string path_;
+    Clock::duration byteTime_;
+    std::ofstream trace_;
+    std::deque<Arrival> backlog_;
+    TimePoint carriedUntil_; // when the line became free after the last byte given out
+    std::uint64_t answersWritten_ = 0;
+    std::uint64_t answersRead_ = 0;
+    TimePoint lookedAt_;
+};
+
+} // namespace emulator
