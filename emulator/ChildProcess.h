@@ -1,0 +1,38 @@
+#pragma once
+
+#include "FileDescriptor.h"
+
+#include <sys/types.h>
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace emulator {
+
+/// A command that runs beside the emulator, in its own process group, and ends with it at the
+/// latest: when this object is destroyed, or by SIGTERM when the emulator is killed.
+class ChildProcess {
+  public:
+    /// Starts the command, found along PATH, with standard input empty. Its standard output and
+    /// error go to `output`, or where the emulator's own go when that is -1. Throws if no process
+    /// can be started; a command that cannot be run ends with status 127.
+    explicit ChildProcess(std::vector<std::string> command, int output = -1);
+    ChildProcess(const ChildProcess &) = delete;
+    ChildProcess &operator=(const ChildProcess &) = delete;
+    /// Ends the command and what it started: SIGTERM, and SIGKILL to what is left 2 s later.
+    ~ChildProcess();
+
+    [[nodiscard]] pid_t pid() const { return pid_; }
+    /// Readable when the command has ended.
+    [[nodiscard]] int descriptor() const { return end_.get(); }
+    /// The command's exit status, 128 + signal if it was killed, nothing while it runs.
+    std::optional<int> status();
+
+  private:
+    pid_t pid_;
+    FileDescriptor end_;
+    std::optional<int> status_;
+};
+
+} // namespace emulator

@@ -1,0 +1,29 @@
+#pragma once
+
+#include "Clock.h"
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace emulator {
+
+/// What panel-emulator was asked to do.
+struct Options {
+    bool help = false;
+    bool fast = false;
+    std::optional<std::string> journey; ///< file, or "-" for standard input
+    std::optional<std::string> pictures;
+    std::optional<std::string> trace;
+    Clock::duration limit = std::chrono::seconds(10);
+    std::vector<std::string> command;
+
+    /// Reads the program's arguments. Throws std::invalid_argument with one line when they are
+    /// wrong.
+    static Options parse(int argc, char *const *argv);
+
+    /// The text of `--help`.
+    static const char *helpText();
+};
+
+} // namespace emulator
