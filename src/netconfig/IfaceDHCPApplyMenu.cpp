@@ -3,6 +3,7 @@
 #include "netconfig/IfaceTypeMenu.h"
 #include "netconfig/NetworkConfig.h"
 #include "runtime/LcdPanel.h"
+#include "runtime/confirmationText.h"
 #include "runtime/leaveScreen.h"
 #include "status/MainMenu.h"
 
@@ -18,7 +19,7 @@ void IfaceDHCPApplyMenu::display(MenuContext *) {
     if (drawn)
         return;
     drawn = true;
-    panel->showText("ESC   - Cancel\nENTER - Apply");
+    panel->showText(confirmationText);
 }
 
 void IfaceDHCPApplyMenu::onEscape(MenuContext *context) {

@@ -1,5 +1,6 @@
 #include "status/MainMenu.h"
 
+#include "hostname/HostnameEditMenu.h"
 #include "netconfig/IfaceTypeMenu.h"
 #include "runtime/LcdPanel.h"
 #include "runtime/beginsWith.h"
@@ -144,7 +145,9 @@ void MainMenu::onEnter(MenuContext *context) {
     if (panel->isHeldLong(keyEnter))
         return;
     const std::string name = *currentPage;
-    if (isEthernet(name)) {
+    if (name == hostnamePage) {
+        enterSubmenu(context, HostnameEditMenu::instance());
+    } else if (isEthernet(name)) {
         IfaceTypeMenu::instance()->selectInterface(name);
         enterSubmenu(context, IfaceTypeMenu::instance());
     }
