@@ -45,6 +45,18 @@ void Operator::press(KeyCode key, int times) {
         hold(key, 1);
 }
 
+void Operator::keys(const std::string &sequence) {
+    static const std::map<char, KeyCode> letters = {
+        {'u', keyUp}, {'d', keyDown}, {'e', keyEnter}, {'x', keyEscape}};
+    for (std::size_t k = 0; k < sequence.length();) {
+        const KeyCode key = letters.at(sequence[k++]);
+        int polls = 0;
+        while (k < sequence.length() && isdigit(sequence[k]))
+            polls = polls * 10 + (sequence[k++] - '0');
+        hold(key, polls == 0 ? 1 : polls);
+    }
+}
+
 void Operator::wait(double seconds) {
     const long long end = world().microseconds + static_cast<long long>(seconds * 1e6);
     while (world().microseconds < end)
@@ -71,6 +83,14 @@ std::string Operator::cursor() {
     if (!display.cursorBlinking())
         return "off";
     return std::to_string(display.cursorRow()) + "," + std::to_string(display.cursorColumn());
+}
+
+void walk(Operator &person, const std::vector<Step> &steps) {
+    for (const auto &[keys, sees, cursor] : steps) {
+        person.keys(keys);
+        ASSERT_EQ(Operator::sees(), sees) << "after " << keys;
+        ASSERT_EQ(Operator::cursor(), cursor) << "after " << keys;
+    }
 }
 
 void inFreshProgram(const std::function<void()> &check) {

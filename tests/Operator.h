@@ -16,9 +16,11 @@ class Operator {
     /// Starts the program on the world as it is now.
     Operator() = default;
 
-    void poll(KeyCode key = keyNone);           ///< one turn, with this key down or none
-    void hold(KeyCode key, int polls);          ///< that many turns with the key down, then release
-    void press(KeyCode key, int times = 1);     ///< as short as the keypad can tell, then released
+    void poll(KeyCode key = keyNone);       ///< one turn, with this key down or none
+    void hold(KeyCode key, int polls);      ///< that many turns with the key down, then release
+    void press(KeyCode key, int times = 1); ///< as short as the keypad can tell, then released
+    /// Presses u, d, e (Enter) and x (Escape) in order; a number holds the key before it so long.
+    void keys(const std::string &sequence);
     void answer(const std::string &bytes);      ///< one turn in which the panel sends just these
     void wait(double seconds);                  ///< turns without a key
     void waitForPage(const std::string &title); ///< until row 0 begins with this; fails in the end
@@ -31,6 +33,12 @@ class Operator {
   private:
     MainLoop loop;
 };
+
+/// What the panel shows once some keys have been pressed, and where its cursor blinks.
+struct Step {
+    std::string keys, sees, cursor = "off";
+};
+void walk(Operator &person, const std::vector<Step> &steps);
 
 /// Runs a check in a process of its own, so that it meets a program that has just been started.
 void inFreshProgram(const std::function<void()> &check);
