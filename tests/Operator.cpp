@@ -20,6 +20,8 @@ std::string withoutBlanksAtEnd(std::string text) {
 
 } // namespace
 
+MainLoop *Operator::running = nullptr;
+
 void standardAppliance(World &appliance) {
     appliance.files["/etc/ma-platform"] = "q75-b\n";
     appliance.portAddresses["eth0"] = "10.1.1.5";
@@ -27,7 +29,7 @@ void standardAppliance(World &appliance) {
 
 void Operator::answer(const std::string &bytes) {
     world().answers = {bytes};
-    loop.turn();
+    loop->turn();
 }
 
 void Operator::poll(KeyCode key) {

@@ -14,7 +14,7 @@ void standardAppliance(World &appliance);
 class Operator {
   public:
     /// Starts the program on the world as it is now.
-    Operator() = default;
+    Operator() : loop(running = new MainLoop) {}
 
     void poll(KeyCode key = keyNone);       ///< one turn, with this key down or none
     void hold(KeyCode key, int polls);      ///< that many turns with the key down, then release
@@ -31,7 +31,8 @@ class Operator {
     static std::string cursor();
 
   private:
-    MainLoop loop;
+    static MainLoop *running; // the program never ends, and neither does its loop
+    MainLoop *loop;
 };
 
 /// What the panel shows once some keys have been pressed, and where its cursor blinks.

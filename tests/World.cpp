@@ -124,6 +124,9 @@ ssize_t __wrap_write(int descriptor, const void *bytes, size_t size) {
         return -1;
     }
     const std::string text(static_cast<const char *>(bytes), size);
+    const bool isCommand = std::exchange(world().commandFollows, text == "\xFE");
+    if (!isCommand && !world().commandFollows && world().onText)
+        world().onText(text);
     for (const char byte : text)
         world().display.receive(static_cast<unsigned char>(byte));
     world().sent += text;
@@ -193,7 +196,6 @@ FILE *__wrap_popen(const char *command, const char *mode) {
         return nullptr;
     world().events.push_back(std::string("run ") + command);
     once(world().duringCommand);
-    world().microseconds += static_cast<long long>(world().secondsPerCommand * 1e6);
     return openContents(world().run(command));
 }
 

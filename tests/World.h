@@ -26,7 +26,7 @@ struct World {
     // The line and the clock. Each poll of the panel takes the next answer; "" is silence.
     std::deque<std::string> answers;
     std::function<void()> duringPoll, duringPause, duringCommand; // each runs once, then is cleared
-    double secondsPerCommand = 0;
+    std::function<void(const std::string &)> onText; // before each write of characters, every time
     long long microseconds = 1'700'000'000'000'000;
 
     // What the program has done.
@@ -35,6 +35,7 @@ struct World {
     std::vector<std::size_t> writes;   // the length of each write
     std::vector<std::string> events;   // "clock", "run COMMAND", "start COMMAND", "screen"
     std::vector<long long> pauses;     // microseconds, the main loop's own left out
+    bool commandFollows = false;       // the last byte was a prefix
     std::vector<std::string> settings; // the line's, made before `main`
 
     std::string run(const std::string &command);
