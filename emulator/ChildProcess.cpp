@@ -3,40 +3,45 @@
 #include "Clock.h"
 
 #include <fcntl.h>
-#include <poll.h>
 #include <sys/prctl.h>
 #include <sys/syscall.h>
 #include <sys/wait.h>
 
+#include <array>
 #include <cerrno>
 #include <csignal>
 #include <cstring>
+#include <ctime>
 #include <system_error>
-#include <thread>
 
 namespace emulator {
 
 namespace {
 
 constexpr std::chrono::seconds gracePeriod{2};
-constexpr std::chrono::milliseconds groupLook{10};
+constexpr timespec endingLook{0, 10'000'000}; // how often to see whether the group is empty
 constexpr int cannotRun = 127;
 
-[[noreturn]] void become(std::vector<std::string> &command, int output, pid_t parent) {
+int shellStatus(int raw) {
+    return WIFEXITED(raw) ? WEXITSTATUS(raw) : 128 + WTERMSIG(raw);
+}
+
+// Has this process ended, as if by SIGTERM, when `parent` is.
+void endWith(pid_t parent) {
     prctl(PR_SET_PDEATHSIG, SIGTERM);
-    // The emulator may have gone before it was asked to tell of its end.
+    // The parent may have gone before it was asked to tell of its end.
     if (getppid() != parent)
         _exit(cannotRun);
+}
+
+[[noreturn]] void become(std::vector<std::string> &command, pid_t guard) {
+    endWith(guard);
     setpgid(0, 0);
     sigset_t none;
     sigemptyset(&none);
     sigprocmask(SIG_SETMASK, &none, nullptr);
-    dup2(open("/dev/null", O_RDONLY | O_CLOEXEC), STDIN_FILENO);
-    if (output >= 0) {
-        dup2(output, STDOUT_FILENO);
-        dup2(output, STDERR_FILENO);
-    }
     std::vector<char *> argv;
+    argv.reserve(command.size() + 1);
     for (std::string &word : command)
         argv.push_back(word.data());
     argv.push_back(nullptr);
@@ -45,38 +50,91 @@ constexpr int cannotRun = 127;
     _exit(cannotRun);
 }
 
+// Waits until the command and its group have ended; SIGTERM makes it end them.
+int waitForGroup(pid_t command, const sigset_t &awaited) {
+    std::optional<int> status;
+    std::optional<TimePoint> giveUp;
+    for (;;) {
+        const int signal =
+            giveUp ? sigtimedwait(&awaited, nullptr, &endingLook) : sigwaitinfo(&awaited, nullptr);
+        int raw = 0;
+        pid_t ended = 0;
+        while ((ended = waitpid(-1, &raw, WNOHANG)) > 0)
+            if (ended == command)
+                status = shellStatus(raw);
+        const bool empty = kill(-command, 0) != 0;
+        if (status && empty)
+            return *status;
+        if (!giveUp && (signal == SIGTERM || status)) {
+            kill(-command, SIGTERM);
+            giveUp = Clock::now() + gracePeriod;
+        } else if (giveUp && Clock::now() >= *giveUp) {
+            kill(-command, SIGKILL);
+        }
+    }
+}
+
+[[noreturn]] void guard(std::vector<std::string> &command, int output, int report, pid_t parent) {
+    // Nothing but SIGKILL ends the guard before the command. Blocked ahead of anything else so
+    // that no request to end the command gets lost.
+    sigset_t all;
+    sigfillset(&all);
+    sigprocmask(SIG_BLOCK, &all, nullptr);
+    endWith(parent);
+    prctl(PR_SET_CHILD_SUBREAPER, 1); // so that orphans of the group do not linger as zombies
+    dup2(open("/dev/null", O_RDONLY | O_CLOEXEC), STDIN_FILENO);
+    if (output >= 0) {
+        dup2(output, STDOUT_FILENO);
+        dup2(output, STDERR_FILENO);
+    }
+    const pid_t self = getpid();
+    const pid_t pid = fork();
+    if (pid == 0)
+        become(command, self);
+    if (pid > 0)
+        setpgid(pid, pid); // as the command does: whoever comes first, the group exists from here
+    if (write(report, &pid, sizeof pid) < 0 || pid < 0)
+        _exit(cannotRun);
+    // The line must hang up with the emulator, not with the guard.
+    close_range(STDERR_FILENO + 1, ~0U, 0);
+    sigset_t awaited;
+    sigemptyset(&awaited);
+    sigaddset(&awaited, SIGCHLD);
+    sigaddset(&awaited, SIGTERM);
+    _exit(waitForGroup(pid, awaited));
+}
+
 } // namespace
 
-ChildProcess::ChildProcess(std::vector<std::string> command, int output) : pid_(-1) {
-    const pid_t parent = getpid();
-    pid_ = fork();
-    if (pid_ < 0)
+ChildProcess::ChildProcess(std::vector<std::string> command, int output) {
+    std::array<int, 2> ends{};
+    if (pipe2(ends.data(), O_CLOEXEC) != 0)
+        throw std::system_error(errno, std::generic_category(), "cannot open a pipe");
+    const FileDescriptor result(ends[0]);
+    FileDescriptor report(ends[1]);
+    const pid_t self = getpid();
+    guard_ = fork();
+    if (guard_ == 0)
+        guard(command, output, report.get(), self);
+    report.reset();
+    if (guard_ < 0 || read(result.get(), &command_, sizeof command_) != sizeof command_ ||
+        command_ < 0)
         throw std::system_error(errno, std::generic_category(), "cannot start a process");
-    if (pid_ == 0)
-        become(command, output, parent);
-    setpgid(pid_, pid_); // as the child does: whoever comes first, the group exists from here on
     // By number: the C library's header for it does not serve C++.
-    end_ = FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, pid_, 0)));
+    end_ = FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, guard_, 0)));
 }
 
 ChildProcess::~ChildProcess() {
-    const TimePoint giveUp = Clock::now() + gracePeriod;
-    kill(-pid_, SIGTERM);
-    pollfd end{end_.get(), POLLIN, 0};
-    if (!status())
-        poll(&end, 1, static_cast<int>(std::chrono::milliseconds(gracePeriod).count()));
-    // What the command had started may end a little later than the command itself.
-    while (status() && kill(-pid_, 0) == 0 && Clock::now() < giveUp)
-        std::this_thread::sleep_for(groupLook);
-    kill(-pid_, SIGKILL);
-    if (!status_)
-        waitpid(pid_, nullptr, 0);
+    if (status())
+        return;
+    kill(guard_, SIGTERM);
+    waitpid(guard_, nullptr, 0);
 }
 
 std::optional<int> ChildProcess::status() {
     int raw = 0;
-    if (!status_ && waitpid(pid_, &raw, WNOHANG) == pid_)
-        status_ = WIFEXITED(raw) ? WEXITSTATUS(raw) : 128 + WTERMSIG(raw);
+    if (!status_ && waitpid(guard_, &raw, WNOHANG) == guard_)
+        status_ = shellStatus(raw);
     return status_;
 }
 

@@ -11,7 +11,10 @@
 namespace emulator {
 
 /// A command that runs beside the emulator, in its own process group, and ends with it at the
-/// latest: when this object is destroyed, or by SIGTERM when the emulator is killed.
+/// latest: when this object is destroyed, and also when the emulator is killed.
+///
+/// A guard process stands between the two. It outlives a killed emulator for as long as it takes
+/// to end the command and what the command left in its group: SIGTERM, and SIGKILL 2 s later.
 class ChildProcess {
   public:
     /// Starts the command, found along PATH, with standard input empty. Its standard output and
@@ -20,17 +23,19 @@ class ChildProcess {
     explicit ChildProcess(std::vector<std::string> command, int output = -1);
     ChildProcess(const ChildProcess &) = delete;
     ChildProcess &operator=(const ChildProcess &) = delete;
-    /// Ends the command and what it started: SIGTERM, and SIGKILL to what is left 2 s later.
+    /// Ends the command and what it started, if it has not ended.
     ~ChildProcess();
 
-    [[nodiscard]] pid_t pid() const { return pid_; }
+    /// The command's process.
+    [[nodiscard]] pid_t pid() const { return command_; }
     /// Readable when the command has ended.
     [[nodiscard]] int descriptor() const { return end_.get(); }
     /// The command's exit status, 128 + signal if it was killed, nothing while it runs.
     std::optional<int> status();
 
   private:
-    pid_t pid_;
+    pid_t guard_ = -1;
+    pid_t command_ = -1;
     FileDescriptor end_;
     std::optional<int> status_;
 };

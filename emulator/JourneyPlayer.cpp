@@ -148,7 +148,7 @@ std::string JourneyPlayer::reasonOfDelay(const Step &step) const {
     case Journey::Action::run:
         return "the command is still running after 60 s";
     default:
-        return "the program does not ask for keys\n" + shown;
+        return "the program does not poll for keys\n" + shown;
     }
 }
 

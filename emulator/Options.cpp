@@ -24,36 +24,35 @@ Clock::duration parseLimit(const std::string &text) {
 } // namespace
 
 Options Options::parse(int argc, char *const *argv) {
-    enum Name : int { help = 1, fast, journey, pictures, trace, limit };
     const option names[] = {
-        {"help", no_argument, nullptr, help},
-        {"fast", no_argument, nullptr, fast},
-        {"journey", required_argument, nullptr, journey},
-        {"pictures", required_argument, nullptr, pictures},
-        {"trace", required_argument, nullptr, trace},
-        {"limit", required_argument, nullptr, limit},
+        {"help", no_argument, nullptr, 'h'},
+        {"fast", no_argument, nullptr, 'f'},
+        {"journey", required_argument, nullptr, 'j'},
+        {"pictures", required_argument, nullptr, 'p'},
+        {"trace", required_argument, nullptr, 't'},
+        {"limit", required_argument, nullptr, 'l'},
         {nullptr, 0, nullptr, 0},
     };
     Options options;
     optind = 0; // start over, whoever parsed before
     for (;;) {
         switch (getopt_long(argc, argv, "+:", static_cast<const option *>(names), nullptr)) {
-        case help:
+        case 'h':
             options.help = true;
             return options;
-        case fast:
+        case 'f':
             options.fast = true;
             break;
-        case journey:
+        case 'j':
             options.journey = optarg;
             break;
-        case pictures:
+        case 'p':
             options.pictures = optarg;
             break;
-        case trace:
+        case 't':
             options.trace = optarg;
             break;
-        case limit:
+        case 'l':
             options.limit = parseLimit(optarg);
             break;
         case ':':

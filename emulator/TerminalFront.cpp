@@ -91,6 +91,7 @@ TerminalFront::TerminalFront(const Display &display, Keypad &keypad)
     mouseinterval(0);
     if (has_colors()) {
         start_color();
+        use_default_colors();
         init_pair(glassColours, COLOR_BLACK, COLOR_GREEN);
     }
     // The two ways in which terminals tell these keys' Shift, where they do.
@@ -216,7 +217,7 @@ bool TerminalFront::letGo(std::optional<Key> pressed) {
 }
 
 void TerminalFront::drawGlass(TimePoint now) const {
-    const attr_t colours = has_colors() ? COLOR_PAIR(glassColours) : A_NORMAL;
+    const attr_t colours = has_colors() ? static_cast<attr_t>(COLOR_PAIR(glassColours)) : A_NORMAL;
     for (int row = 0; row < Display::rowCount; row++) {
         std::string text = display_.visibleRow(row);
         std::replace_if(

@@ -10,7 +10,9 @@ constexpr int exitFailed = 1;
 constexpr int exitUsage = 2;
 
 int complain(int status, const std::string &message) {
-    std::cerr << "panel-emulator: " << message << '\n';
+    std::cerr << "panel-emulator: " << message;
+    if (message.back() != '\n')
+        std::cerr << '\n'; // a picture at its end brings its own
     return status;
 }
 
