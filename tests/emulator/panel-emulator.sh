@@ -1,7 +1,6 @@
 #!/bin/sh
 # Runs the real panel-emulator ($1) on a small program that polls keys, and on what goes wrong.
-emulator=$1
-work=$(mktemp -d) && cd "$work" && trap 'rm -r "$work"' EXIT || exit 1
+emulator=$1 && work=$(mktemp -d) && cd "$work" && trap 'rm -r "$work"' EXIT || exit 1
 check() { # STATUS:LINES-OF-COMPLAINT ARGUMENT...; the journey is on standard input
     want=$1 && shift && timeout 30 "$emulator" "$@" >out 2>err
     got=$?:$(wc -l <err)
