@@ -145,9 +145,11 @@ std::optional<int> Emulator::takeSignal() {
 
 int Emulator::finish(int status) {
     front_.reset();
+    const bool endedByItself = command_->status().has_value();
     command_.reset();
     drainOutput();
-    std::cerr << outputTail_;
+    if (endedByItself)
+        std::cerr << outputTail_;
     if (player_ && display_.unknownCommands() + display_.hiddenCharacters() > 0) {
         std::cout << "unknown commands: " << display_.unknownCommands()
                   << ", characters past the visible columns: " << display_.hiddenCharacters()

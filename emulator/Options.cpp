@@ -36,7 +36,7 @@ Options Options::parse(int argc, char *const *argv) {
     Options options;
     optind = 0; // start over, whoever parsed before
     for (;;) {
-        switch (getopt_long(argc, argv, "+:", static_cast<const option *>(names), nullptr)) {
+        switch (getopt_long(argc, argv, "+:h", static_cast<const option *>(names), nullptr)) {
         case 'h':
             options.help = true;
             return options;
@@ -84,7 +84,7 @@ ways. COMMAND's standard input is empty.
   --fast             show bytes as they come instead of at 2400 baud
   --trace FILE       write a line for each arrival (<) and answer (>) to FILE:
                      monotonic nanoseconds, direction, bytes in hex
-  --help             show this text
+  -h, --help         show this text
 
 On the terminal:
   arrow up, arrow down, Enter, Escape    tap the panel's key of that name
@@ -92,7 +92,7 @@ On the terminal:
                                          or any other key is
   mouse on a drawn key                   down is down, up is up
   q                                      quit
-COMMAND's output is kept back; its end is shown when the panel is gone.
+COMMAND's output is kept back; the last of it is shown if COMMAND ends by itself.
 
 A journey has one step a line; # begins a comment. KEY is up, down, enter or
 escape. A word with blanks stands in quotes, with \" and \\ for " and \.
