@@ -26,7 +26,7 @@ using Journey = std::vector<Action>;
 
 using Random = std::mt19937;
 int upTo(Random &random, int most) {
-    return static_cast<int>(random() % (most + 1U));
+    return static_cast<int>(random() % (static_cast<unsigned>(most) + 1));
 }
 template <typename T> T oneOf(Random &random, const std::vector<T> &choices) {
     return choices[random() % choices.size()];
@@ -102,7 +102,8 @@ class Watch {
   public:
     explicit Watch(long long *turnCount) : turns(turnCount) {
         world().onText = [](const std::string &text) {
-            ASSERT_LE(world().display.cursorColumn() + text.length(), 40U) << "runs past: " << text;
+            const auto column = static_cast<std::size_t>(world().display.cursorColumn());
+            ASSERT_LE(column + text.length(), 40U) << "runs past: " << text;
         };
     }
 

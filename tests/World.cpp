@@ -96,7 +96,8 @@ std::vector<std::string> World::commands(const std::string &beginning) const {
     return found;
 }
 
-// The calls of the program, and of nobody else, are led here by the linker.
+// The calls of the program, and of nobody else, are led here by the linker, which gives the names.
+// NOLINTBEGIN(bugprone-reserved-identifier,readability-inconsistent-declaration-parameter-name)
 extern "C" {
 
 int __real_open(const char *path, int flags, mode_t mode);
@@ -217,3 +218,4 @@ FILE *fopen64(const char *path, const char *mode) {
 }
 
 } // extern "C"
+// NOLINTEND(bugprone-reserved-identifier,readability-inconsistent-declaration-parameter-name)

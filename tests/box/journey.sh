@@ -1,0 +1,12 @@
+# Plays a journey with the real program in the box. The pictures that it takes have to be those of
+# the documentation, byte for byte: EMULATOR PROGRAM JOURNEY.
+cd "$(dirname "$(realpath "$0")")/../.." || exit 1
+taken=$(mktemp -d)
+trap 'rm -r "$taken"' EXIT
+"$1" --journey "$3" --pictures "$taken" -- box/kestrova-panel-box -- "$2" || exit 1
+for picture in "$taken"/*.svg; do
+    cmp "$picture" "docs/pictures/${picture##*/}" || {
+        echo "no longer what the panel shows: scripts/demo --renew-pictures renews the pictures"
+        exit 1
+    }
+done
