@@ -58,6 +58,7 @@ TEST(Config, ServersAreReadFromTheirOwnFileButNotWithoutTheOther) {
     NetworkConfig config = loaded("", servers);
     EXPECT_EQ(config.getDns(2), "");
     config.setDns(2, "1.1.1.1");
+    config.removeDns(2);
     config.removeDns(UINT32_MAX);
     config.addDns("0.0.0.0");
     config.addDns("");

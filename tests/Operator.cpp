@@ -13,11 +13,6 @@ std::string answerFor(KeyCode key) {
     return key == keyNone ? "" : answers.at(key);
 }
 
-std::string withoutBlanksAtEnd(std::string text) {
-    text.erase(text.find_last_not_of(' ') + 1);
-    return text;
-}
-
 } // namespace
 
 MainLoop *Operator::running = nullptr;
@@ -75,9 +70,7 @@ void Operator::waitForPage(const std::string &title) {
 }
 
 std::string Operator::sees() {
-    const auto &display = world().display;
-    return withoutBlanksAtEnd(display.visibleRow(0)) + "|" +
-           withoutBlanksAtEnd(display.visibleRow(1));
+    return world().shown();
 }
 
 std::string Operator::cursor() {
@@ -85,14 +78,6 @@ std::string Operator::cursor() {
     if (!display.cursorBlinking())
         return "off";
     return std::to_string(display.cursorRow()) + "," + std::to_string(display.cursorColumn());
-}
-
-void walk(Operator &person, const std::vector<Step> &steps) {
-    for (const auto &[keys, sees, cursor] : steps) {
-        person.keys(keys);
-        ASSERT_EQ(Operator::sees(), sees) << "after " << keys;
-        ASSERT_EQ(Operator::cursor(), cursor) << "after " << keys;
-    }
 }
 
 void inFreshProgram(const std::function<void()> &check) {

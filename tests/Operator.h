@@ -25,7 +25,6 @@ class Operator {
     void wait(double seconds);                  ///< turns without a key
     void waitForPage(const std::string &title); ///< until row 0 begins with this; fails in the end
 
-    /// Both rows without the blanks at their ends, as "row 0|row 1".
     static std::string sees();
     /// Where the cursor blinks, as "row,column", or "off".
     static std::string cursor();
@@ -34,12 +33,6 @@ class Operator {
     static MainLoop *running; // the program never ends, and neither does its loop
     MainLoop *loop;
 };
-
-/// What the panel shows once some keys have been pressed, and where its cursor blinks.
-struct Step {
-    std::string keys, sees, cursor = "off";
-};
-void walk(Operator &person, const std::vector<Step> &steps);
 
 /// Runs a check in a process of its own, so that it meets a program that has just been started.
 void inFreshProgram(const std::function<void()> &check);

@@ -3,6 +3,7 @@
 #include "Operator.h"
 
 #include <algorithm>
+#include <array>
 #include <csignal>
 #include <filesystem>
 #include <iostream>
@@ -13,9 +14,9 @@
 
 namespace {
 
-constexpr unsigned sessions = 80;
+constexpr unsigned journeys = 80;
 constexpr long long leastTurns = 1'000'000;
-constexpr int actionsPerSession = 900;
+constexpr int actionsPerJourney = 900;
 
 // A letter for what is done, as in `Operator::keys`, and how often or how long.
 struct Action {
@@ -71,7 +72,7 @@ void setUpAppliance(Random &random) {
 
 Journey randomJourney(Random &random) {
     Journey journey;
-    for (int k = 0; k < actionsPerSession; ++k) {
+    for (int k = 0; k < actionsPerJourney; ++k) {
         const char what =
             oneOf<char>(random, {'u', 'd', 'd', 'e', 'e', 'e', 'x', 'w', 'g', 's', 'c', 'B'});
         journey.push_back({what, oneOf<int>(random, {1, 1, 1, 2, 5, 6, 7, 30})});
@@ -101,10 +102,7 @@ bool isApplyScreen() {
 class Watch {
   public:
     explicit Watch(long long *turnCount) : turns(turnCount) {
-        world().onText = [](const std::string &text) {
-            const auto column = static_cast<std::size_t>(world().display.cursorColumn());
-            ASSERT_LE(column + text.length(), 40U) << "runs past: " << text;
-        };
+        world().onText = [this](const std::string &text) { note(text); };
     }
 
     void poll(KeyCode key) {
@@ -112,6 +110,7 @@ class Watch {
         const long long before = world().microseconds;
         world().events.clear();
         world().sent.clear();
+        noted = 0;
         person.poll(key);
         ++*turns;
         const bool hasApplied =
@@ -122,6 +121,8 @@ class Watch {
             << "asked no key";
         EXPECT_LE(world().microseconds - before, 3'600'000) << "stopped answering";
         EXPECT_EQ(world().display.unknownCommands(), 0U);
+        for (const int row : {0, 1})
+            EXPECT_EQ(world().display.wholeRow(row), rows.at(static_cast<std::size_t>(row)));
     }
 
     void act(const Action &action) {
@@ -154,6 +155,20 @@ class Watch {
     }
 
   private:
+    // Keeps by itself what was written where since the panel was last cleared.
+    void note(const std::string &text) {
+        if (world().sent.find("\xFE\x01", noted) != std::string::npos)
+            rows = blankRows;
+        noted = world().sent.length();
+        const auto column = static_cast<std::size_t>(world().display.cursorColumn());
+        ASSERT_LE(column + text.length(), 40U) << "runs past: " << text;
+        rows.at(static_cast<std::size_t>(world().display.cursorRow()))
+            .replace(column, text.length(), text);
+    }
+
+    const std::array<std::string, 2> blankRows = {std::string(40, ' '), std::string(40, ' ')};
+    std::array<std::string, 2> rows = blankRows;
+    std::size_t noted = 0; // how much of what was sent
     Operator person;
     long long *turns;
 };
@@ -210,8 +225,8 @@ Journey shortest(unsigned seed, Journey journey, long long *turns) {
 TEST(RandomOperator, FindsNoScreenThatBreaksItsPromises) {
     auto *turns = static_cast<long long *>(mmap(nullptr, sizeof(long long), PROT_READ | PROT_WRITE,
                                                 MAP_SHARED | MAP_ANONYMOUS, -1, 0));
-    for (unsigned seed = 1; seed <= sessions; ++seed) {
-        Random random(seed + sessions);
+    for (unsigned seed = 1; seed <= journeys; ++seed) {
+        Random random(seed + journeys);
         const Journey journey = randomJourney(random);
         if (holds(seed, journey, turns, true))
             continue;

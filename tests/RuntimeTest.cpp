@@ -92,7 +92,9 @@ TEST(Runtime, CommandsAreTwoSingleBytesAndTheCursorGoesWhereItIsSent) {
     LcdPanel::instance()->clear();
     EXPECT_EQ(world().writes, std::vector<std::size_t>(4, 1));
     world().lineTakesBytes = false;
+    world().writesTried = 0;
     EXPECT_EQ(LcdPanel::instance()->sendCommand(0x01), -1);
+    EXPECT_EQ(world().writesTried, 1);
 }
 
 TEST(Runtime, ATextIsTwoRowsOfSixteenAndTheRestIsDroppedOrScrolled) {
@@ -182,7 +184,7 @@ TEST(Runtime, ASignalAtAnyTimeRefreshesThePagesAndEndsAHold) {
     person.poll(keyDown);
     EXPECT_EQ(Operator::sees(), "Hostname:|monitor");
     world().duringPoll = interrupt;
-    person.poll(); // no key, and a new start at the first page
+    person.poll(keyDown); // not read: no key, and a new start at the first page
     EXPECT_EQ(Operator::sees(), "Kestrova (TM)|cabinetDevice");
     person.poll(keyDown); // the key never left the keypad, yet counts as pressed again
     EXPECT_EQ(Operator::sees(), "Hostname:|monitor");

@@ -51,6 +51,15 @@ FILE *openContents(const std::string &contents) {
 
 } // namespace
 
+std::string World::shown() const {
+    const auto withoutBlanksAtEnd = [](std::string row) {
+        row.erase(row.find_last_not_of(' ') + 1);
+        return row;
+    };
+    return withoutBlanksAtEnd(display.visibleRow(0)) + "|" +
+           withoutBlanksAtEnd(display.visibleRow(1));
+}
+
 std::string World::run(const std::string &command) {
     static const std::string listing =
         "echo \"`ifconfig -s |       sed 1d |       egrep -v 'lo|ani|docker|v|ipsec_|ssl_' |"
@@ -120,6 +129,7 @@ int __wrap_open(const char *path, int flags, ...) {
 ssize_t __wrap_write(int descriptor, const void *bytes, size_t size) {
     if (descriptor != panelDescriptor)
         return __real_write(descriptor, bytes, size);
+    ++world().writesTried;
     if (!world().lineTakesBytes) {
         errno = EAGAIN;
         return -1;
@@ -168,7 +178,7 @@ ssize_t __wrap_read(int descriptor, void *buffer, size_t size) {
 int __wrap_usleep(useconds_t duration) {
     world().microseconds += duration;
     if (duration != turnPause)
-        world().pauses.push_back(duration);
+        world().pauses.push_back(std::to_string(duration / 1'000'000) + " s " + world().shown());
     once(world().duringPause);
     return 0;
 }
@@ -187,6 +197,7 @@ int __wrap_system(const char *command) {
         world().settings.emplace_back(command);
     } else {
         world().events.push_back(std::string("start ") + command);
+        world().scripts.push_back(command + (" behind " + world().shown()));
     }
     return 0;
 }
@@ -196,6 +207,8 @@ FILE *__wrap_popen(const char *command, const char *mode) {
     if (!world().shellWorks)
         return nullptr;
     world().events.push_back(std::string("run ") + command);
+    if (startsWith(command, applyScript))
+        world().scripts.push_back(command + (" behind " + world().shown()));
     once(world().duringCommand);
     return openContents(world().run(command));
 }

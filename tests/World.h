@@ -31,13 +31,17 @@ struct World {
 
     // What the program has done.
     emulator::Display display;
-    std::string sent;                  // bytes written, and
-    std::vector<std::size_t> writes;   // the length of each write
-    std::vector<std::string> events;   // "clock", "run COMMAND", "start COMMAND", "screen"
-    std::vector<long long> pauses;     // microseconds, the main loop's own left out
-    bool commandFollows = false;       // the last byte was a prefix
+    std::string sent; // bytes written, and
+    int writesTried = 0;
+    std::vector<std::size_t> writes;  // the length of each write
+    std::vector<std::string> events;  // "clock", "run COMMAND", "start COMMAND", "open PATH", "row"
+    std::vector<std::string> pauses;  // "3 s ROWS": how long and over which screen; not the loop's
+    std::vector<std::string> scripts; // "COMMAND behind ROWS": the configuration script's runs
+    bool commandFollows = false;      // the last byte was a prefix
     std::vector<std::string> settings; // the line's, made before `main`
 
+    /// Both rows without the blanks at their ends, as "row 0|row 1".
+    std::string shown() const;
     std::string run(const std::string &command);
     std::vector<std::string> commands(const std::string &beginning) const;
 };

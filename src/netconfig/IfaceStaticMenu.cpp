@@ -72,6 +72,10 @@ void IfaceStaticMenu::moveMarkerTo(bool bottomRow) {
     cursorRow = bottomRow;
 }
 
+std::int32_t IfaceStaticMenu::selectedItem() const {
+    return topItem + (cursorRow ? 1 : 0);
+}
+
 void IfaceStaticMenu::selectFirstItem() {
     topItem = 0;
     cursorRow = false;
@@ -116,7 +120,7 @@ void IfaceStaticMenu::onEscape(MenuContext *context) {
 void IfaceStaticMenu::onEnter(MenuContext *context) {
     if (isHeld(panel, keyEnter))
         return;
-    if (topItem + (cursorRow ? 1 : 0) == applyItem) {
+    if (selectedItem() == applyItem) {
         applyChanges(context);
     } else {
         openItem(context);
@@ -125,7 +129,7 @@ void IfaceStaticMenu::onEnter(MenuContext *context) {
 
 void IfaceStaticMenu::openItem(MenuContext *context) {
     Menu *next = nullptr;
-    switch (topItem + (cursorRow ? 1 : 0)) {
+    switch (selectedItem()) {
     case setAddress:
         next = screenFor<IfaceStaticEditIPMenu>(config);
         break;

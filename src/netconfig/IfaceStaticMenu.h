@@ -33,6 +33,7 @@ class IfaceStaticMenu : public Menu {
     std::string renderItems() const;
     void redrawItems();
     void moveMarkerTo(bool bottomRow);
+    std::int32_t selectedItem() const;
     void selectFirstItem();
     void openItem(MenuContext *context);
     void applyChanges(MenuContext *context);

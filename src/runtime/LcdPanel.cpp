@@ -8,6 +8,7 @@
 #include <cstdlib>
 #include <fcntl.h>
 #include <poll.h>
+#include <string_view>
 #include <unistd.h>
 
 namespace {
@@ -30,8 +31,7 @@ constexpr std::array lineSettings = {
 constexpr std::size_t visibleColumns = 16;
 constexpr int lastColumn = 39;
 const std::string linePad(visibleColumns, ' ');
-constexpr const char *marqueeGap = "   ";
-constexpr std::uint32_t marqueeGapLength = 3;
+constexpr std::string_view marqueeGap = "   ";
 
 constexpr int keyTimeoutMs = 500;
 constexpr std::size_t answerBufferSize = 256; // bytes
@@ -160,21 +160,21 @@ void LcdPanel::resetMarquee() {
 }
 
 void LcdPanel::scrollMarqueeForward() {
-    const auto lastOffset = static_cast<std::int32_t>(
-        static_cast<std::uint32_t>(marqueeText.length()) + marqueeGapLength - 1);
-    marqueeOffset = marqueeOffset < lastOffset ? marqueeOffset + 1 : 0;
+    marqueeOffset = marqueeOffset < lastMarqueeOffset() ? marqueeOffset + 1 : 0;
     drawMarquee();
 }
 
 void LcdPanel::scrollMarqueeBackward() {
-    const auto lastOffset = static_cast<std::int32_t>(
-        static_cast<std::uint32_t>(marqueeText.length()) + marqueeGapLength - 1);
-    marqueeOffset = marqueeOffset > 0 ? marqueeOffset - 1 : lastOffset;
+    marqueeOffset = marqueeOffset > 0 ? marqueeOffset - 1 : lastMarqueeOffset();
     drawMarquee();
 }
 
+std::int32_t LcdPanel::lastMarqueeOffset() const {
+    return static_cast<std::int32_t>(marqueeText.length() + marqueeGap.length()) - 1;
+}
+
 void LcdPanel::drawMarquee() {
-    const std::string cycle = marqueeText + marqueeGap + marqueeText;
+    const std::string cycle = marqueeText + marqueeGap.data() + marqueeText;
     const std::string view = cycle.substr(static_cast<std::size_t>(marqueeOffset), visibleColumns);
     setCursor(1, 0);
     writeAtCursor(view.data(), static_cast<int>(view.length()));

@@ -62,6 +62,7 @@ class LcdPanel {
     void configureLine();
     void send(const char *bytes, std::size_t length);
     void drawMarquee();
+    std::int32_t lastMarqueeOffset() const;
     std::uint32_t pollsHeld(KeyCode key) const;
 
     int fd;

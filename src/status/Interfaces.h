@@ -11,6 +11,6 @@ std::vector<std::string> listPagedInterfaces();
 /// Ports are told apart by their first four characters, so "eth0.100" has the label of "eth0".
 std::string portLabel(const std::string &name);
 
-/// The IPv4 address of an interface as `ifconfig` prints it, line feed included; "" when it has
+/// The first address of an interface as `ifconfig` prints it, line feed included; "" when it has
 /// none, "ERROR" when no shell could be started.
 std::string interfaceAddress(const std::string &name);
