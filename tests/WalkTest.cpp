@@ -12,6 +12,7 @@
 
 #include <filesystem>
 #include <fstream>
+#include <iomanip>
 #include <optional>
 #include <sstream>
 
@@ -27,8 +28,9 @@ std::string replaced(std::string text, const std::string &word, const std::strin
 
 std::string hex(const std::string &bytes) {
     std::ostringstream text;
-    for (const unsigned char byte : bytes)
-        text << " " << std::uppercase << std::hex << (byte < 16 ? "0" : "") << int{byte};
+    for (const char byte : bytes)
+        text << " " << std::uppercase << std::hex << std::setfill('0') << std::setw(2)
+             << int{static_cast<unsigned char>(byte)};
     return text.str();
 }
 
