@@ -1,17 +1,17 @@
 #!/bin/sh
-# Installs, runs, upgrades, removes and purges the packages in folder $1 in a throw-away Debian with a
+# Installs, runs, upgrades, removes and purges the packages of folder $1 in a throw-away Debian with a
 # service manager of its own. What is not real there: the line is a pseudo-terminal, and its record
-# among the devices is written by hand, on behalf of a terminal that the kernel has.
+# among the devices is written by hand, in the place of a terminal that the kernel has.
 here=$(dirname "$(realpath "$0")")
 . "$here/../box/expect.sh"
 cached=${XDG_CACHE_HOME:-$HOME/.cache}/kestrova-panel/debian-12
 work=$(mktemp -d)
 root=$work/root
-manager=
-trap '[ -z "$manager" ] || kill -KILL "$(leader)"; wait; rm -rf "$work"' EXIT
+trap '[ -z "${manager-}" ] || kill -KILL "$(leader)" 2>/dev/null; wait; rm -rf "$work"' EXIT
+trap 'exit 1' HUP INT TERM
 
 cannot() { # said loudly; where CI runs it has to be possible
-    echo "SKIPPED: THE PACKAGES WERE NOT INSTALLED ANYWHERE: $*" >&2
+    echo "SKIPPED: THE PACKAGES WERE NOT INSTALLED ANYWHERE: $*"
     [ "${CI-}" != true ] && exit 0
     exit 1
 }
@@ -19,14 +19,16 @@ must() { "$@" >"$work/log" 2>&1 || { cat "$work/log"; echo "FAILED $*"; exit 1; 
 export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
 container="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --directory=$root"
 leader() { cut -d ' ' -f 1 "/proc/$manager/task/$manager/children"; }
-inside() { nsenter --target "$(leader)" --all env -i PATH="$PATH" "$@"; }
-await_boot() { # of a system whose first process is not $1
-    tries=120
-    until [ "$(leader)" != "$1" ] && [ "$(inside systemctl is-system-running 2>&1)" = running ]; do
-        tries=$((tries - 1))
-        [ $tries -gt 0 ] || must false "the system does not come up"
+inside() { nsenter --target "$(leader)" --all env -i PATH=/usr/sbin:/usr/bin "$@"; }
+boot() {
+    $container --boot --private-network --capability=CAP_NET_ADMIN,CAP_BPF \
+        --system-call-filter=bpf </dev/null >"$work/boot" 2>&1 &
+    manager=$!
+    for _ in $(seq 120); do
+        [ "$(inside systemctl is-system-running 2>&1)" != running ] || return 0
         sleep 0.5
     done
+    must false "$(cat "$work/boot")"
 }
 leftovers() {
     find "$root/etc" "$root/usr" "$root/var" -path '*/cache/apt' -prune -o \
@@ -40,12 +42,11 @@ leftovers() {
         >"$work/log" 2>&1 && mv "$root" "$cached" || { cat "$work/log"; cannot "debootstrap failed"; }
 }
 cp -a "$cached" "$root"
-cp "$1"/*.deb "$here"/*.journey "$root/root"
+cp "$1"/*.deb "$here/service.journey" "$root/root"
 dpkg-deb -R "$1"/kestrova-panel_*.deb "$work/upgrade"
 sed -i '/^Version:/s/$/.1/' "$work/upgrade/DEBIAN/control"
 must dpkg-deb -b "$work/upgrade" "$root/root/upgrade.deb"
-sed -n '/^```sh$/,/^```$/p' "$here/../../docs/integration.md" | sed -n '/^#!/,/^```/{/^```/!p}' \
-    >"$root/root/example"
+sed -n '/^#!/,/^```/{/^```/!p}' "$here/../../docs/integration.md" >"$root/root/example"
 chmod +x "$root/root/example"
 
 # Where no service manager runs, as in an image's build.
@@ -54,20 +55,16 @@ must $container sh -c "$apt install /root/kestrova-panel_*.deb && dpkg --purge k
 expect "left after an installation without a service manager" "" "$(leftovers)"
 must $container sh -c "$apt install /root/kestrova-*.deb"
 expect "enabled" kestrova-panel.service "$(ls "$root/etc/systemd/system/dev-ttyS1.device.wants")"
-cp -R "$root"/usr/share/kestrova-panel/box/appliance/etc "$root"/usr/share/kestrova-panel/box/appliance/opt "$root"
-ln -s /dev/null "$root/etc/systemd/system/networking.service" # would not find its ports at boot
 
-$container --boot --private-network --capability=CAP_NET_ADMIN,CAP_BPF --system-call-filter=bpf \
-    </dev/null >"$work/boot" 2>&1 &
-manager=$!
-await_boot ""
+cp -R "$root"/usr/share/kestrova-panel/box/appliance/[eo]* "$root"
+ln -s /dev/null "$root/etc/systemd/system/networking.service" # would not find its ports at boot
+boot
 must inside sh -ec '
     mkdir -p /run/udev/data /run/udev/tags/systemd
     printf "I:1\nE:SYSTEMD_ALIAS=/dev/ttyS1\nG:systemd\nQ:systemd\nV:1\n" >/run/udev/data/c4:60
     for port in eth0 eth1; do
-        ip link add $port type veth peer name v-$port
+        ip link add $port up type veth peer name v-$port
         ip link set v-$port up
-        ip link set $port up
     done
     ip addr add 192.0.2.10/24 dev eth0
     ip addr add 198.51.100.20/24 dev eth1
@@ -75,16 +72,17 @@ must inside sh -ec '
     printf "%s\n" "interface v-eth1" "start 198.51.100.100" "end 198.51.100.100" \
         "option subnet 255.255.255.0" >/run/udhcpd.conf
     touch /var/lib/misc/udhcpd.leases
-    udhcpd /run/udhcpd.conf'
-play="panel-emulator --fast --trace /root/trace --journey"
-must inside $play /root/service.journey -- sleep infinity
+    udhcpd /run/udhcpd.conf
+    systemd-run sh -c "panel-emulator --fast --trace /root/trace --journey /root/service.journey \
+        -- sleep infinity >/root/played 2>&1; systemctl poweroff"'
+must timeout 300 tail -f --pid=$manager /dev/null
+wait $manager
+[ $? -eq 133 ] || must false "no reboot was asked for: $(cat "$root/root/played")"
 echo "first byte on the line after $((($(head -n 1 "$root/root/trace" | cut -d ' ' -f 1) / 1000 -
     $(cat "$root/root/started")) / 1000)) ms"
-first=$(leader)
-must inside systemd-run $play /root/hostname.journey -- sleep infinity
-await_boot "$first"
-expect "name after the reboot" rack12-monitor-westb "$(inside hostname)"
 
+boot
+expect "name after the reboot" rack12-monitor-westb "$(inside hostname)"
 must inside dpkg --purge kestrova-panel kestrova-panel-tools
 expect "left behind" "" "$(leftovers)"
 exit $failed

@@ -1,0 +1,27 @@
+# What an installation from build folder $1, for prefix $2, holds, and that it works where it lies.
+. "$(dirname "$0")/../box/expect.sh"
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+prefix=$work$2
+unit=$prefix/lib/systemd/system/kestrova-panel.service
+
+DESTDIR=$work cmake --install "$1" --component program >/dev/null
+expect "programs" kestrova-panel "$(find "$prefix" -type f -perm -1 -exec basename {} +)"
+expect "its path in the service" "$2/sbin/kestrova-panel" "$(sed -n 's/^ExecStart=.* //p' "$unit")"
+expect "the service's faults" "" "$(systemd-analyze verify --man=no "$unit" 2>&1)"
+systemd-analyze security --offline=true --threshold=50 "$unit" >"$work/exposure" 2>&1
+expect "status at an exposure below 5.0" 0 $?
+
+DESTDIR=$work cmake --install "$1" --component tools >/dev/null
+gunzip -r "$prefix/share/man"
+expect "faults of four manual pages" "4 " "$(find "$prefix/share/man" -type f | wc -l) $(
+    mandoc -Tlint -W warning "$prefix"/share/man/man?/*)"
+
+cd "$prefix/share/kestrova-panel" || exit 1
+printf '%s\n' 'expect "Kestrova (TM)" "cabinetDevice"' \
+    'run box/kestrova-panel-box --enter $PANEL_COMMAND_PID -- pidof kestrova-panel' |
+    "$prefix/bin/panel-emulator" --fast --journey - -- \
+        "$prefix/bin/kestrova-panel-box" -- "$prefix/sbin/kestrova-panel" >"$work/said" 2>&1
+expect "status of the tools where they lie" 0 $?
+[ $failed -eq 0 ] || cat "$work/exposure" "$work/said"
+exit $failed
