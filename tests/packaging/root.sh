@@ -18,7 +18,7 @@ cannot() { # said loudly; where CI runs it has to be possible
 must() { "$@" >"$work/log" 2>&1 || { cat "$work/log"; echo "FAILED $*"; exit 1; }; }
 export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
 container="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --directory=$root"
-leader() { cut -d ' ' -f 1 "/proc/$manager/task/$manager/children"; }
+leader() { cut -d " " -f 1 "/proc/$manager/task/$manager/children" 2>/dev/null; }
 inside() { nsenter --target "$(leader)" --all env -i PATH=/usr/sbin:/usr/bin "$@"; }
 boot() {
     $container --boot --private-network --capability=CAP_NET_ADMIN,CAP_BPF \
