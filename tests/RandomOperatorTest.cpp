@@ -105,13 +105,14 @@ class Watch {
         world().onText = [this](const std::string &text) { note(text); };
     }
 
-    void poll(KeyCode key) {
+    // One turn with this key down, or with an answer that is none.
+    void poll(KeyCode key, const std::string &garbled = "") {
         const bool mayApply = isApplyScreen() && key == keyEnter;
         const long long before = world().microseconds;
         world().events.clear();
         world().sent.clear();
         noted = 0;
-        person.poll(key);
+        garbled.empty() ? person.poll(key) : person.answer(garbled);
         ++*turns;
         const bool hasApplied =
             !world().commands("run " + applyScript).empty() || !world().commands("start ").empty();
@@ -130,7 +131,7 @@ class Watch {
             {'u', keyUp}, {'d', keyDown}, {'e', keyEnter}, {'x', keyEscape}, {'w', keyNone}};
         const auto interrupt = [] { raise(SIGUSR1); };
         if (action.what == 'g')
-            person.answer(std::string(static_cast<std::size_t>(action.amount), '\xBB').substr(1));
+            poll(keyNone, std::string(static_cast<std::size_t>(action.amount), '\xB8'));
         if (action.what == 's')
             world().duringPoll = interrupt;
         if (action.what == 'c')

@@ -52,6 +52,8 @@ TEST(Screens, AnEditorWithoutSettingsDrawsAndStoresNothing) {
     EXPECT_EQ(world().sent, "");
     for (int octet = 0; octet < 4; ++octet)
         context.onEnter();
+    context.display();
+    EXPECT_EQ(Operator::sees(), "> Set IP Addr|  Set Netmask  v");
 }
 
 TEST(Screens, EnterOnAPortComputesThePageBeforeItAndReadsBothFiles) {

@@ -1,6 +1,5 @@
 #include "Operator.h"
 
-#include "runtime/LcdPanel.h"
 #include "status/Interfaces.h"
 #include "status/PageTexts.h"
 

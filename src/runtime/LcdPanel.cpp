@@ -170,7 +170,7 @@ void LcdPanel::scrollMarqueeBackward() {
 }
 
 std::int32_t LcdPanel::lastMarqueeOffset() const {
-    return static_cast<std::int32_t>(marqueeText.length() + marqueeGap.length()) - 1;
+    return static_cast<std::int32_t>(marqueeText.length() + marqueeGap.length() - 1);
 }
 
 void LcdPanel::drawMarquee() {
