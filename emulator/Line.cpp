@@ -80,7 +80,12 @@ void Line::collect() {
     // sees an answer that the kernel is still passing on.
     if (answersRead_ != answersWritten_ && backlog_.size() < backlogBytes) {
         pollfd unread{slave_.get(), POLLIN, 0};
-        if (poll(&unread, 1, 0) == 0)
+        const bool nothing = poll(&unread, 1, 0) == 0;
+        // A line that was hung up has forgotten what was unread, and this end has to be opened anew.
+        const bool hungUp = (unread.revents & POLLHUP) != 0;
+        if (hungUp)
+            slave_ = FileDescriptor(open(path_.c_str(), O_RDWR | O_NOCTTY | O_CLOEXEC));
+        if (nothing || hungUp)
             answersRead_ = answersWritten_;
     }
 }
