@@ -5,7 +5,7 @@
 here=$(dirname "$(realpath "$0")")
 . "$here/../box/expect.sh"
 cached=${XDG_CACHE_HOME:-$HOME/.cache}/kestrova-panel/debian-12
-work=$(mktemp -d)
+work=$(mktemp -d) || exit 1
 root=$work/root
 trap '[ -z "${manager-}" ] || kill -KILL "$(leader)" 2>/dev/null; wait; rm -rf "$work"' EXIT
 trap 'exit 1' HUP INT TERM
@@ -42,12 +42,47 @@ leftovers() {
         >"$work/log" 2>&1 && mv "$root" "$cached" || { cat "$work/log"; cannot "debootstrap failed"; }
 }
 cp -a "$cached" "$root"
-cp "$1"/*.deb "$here/service.journey" "$root/root"
+cp "$1"/*.deb "$here/line" "$root/root"
 dpkg-deb -R "$1"/kestrova-panel_*.deb "$work/upgrade"
 sed -i '/^Version:/s/$/.1/' "$work/upgrade/DEBIAN/control"
 must dpkg-deb -b "$work/upgrade" "$root/root/upgrade.deb"
+
+# The two scripts there are, as delivered, and with a gate where they have taken the port down or are
+# about to change the name.
 sed -n '/^#!/,/^```/{/^```/!p}' "$here/../../docs/integration.md" >"$root/root/example"
-chmod +x "$root/root/example"
+cp "$here/../../box/appliance/opt/kestrova/scripts/ezio/apply.py" "$root/root/stand-in"
+gate=/opt/kestrova/gate
+mkdir -p "$root$gate"
+cp "$here/gate" "$root$gate"
+sed "s|^ifup |$gate/gate wait; &|; s|^ *echo .*hostname.new|$gate/gate wait; &|; s/systemctl reboot/:/" \
+    "$root/root/example" >"$root$gate/example"
+sed "s|run(\"ifconfig\"|run(\"$gate/gate\", \"wait\"); &|; s|run(\"hostname\"|run(\"$gate/gate\", \"wait\"); &|
+    s/run(\"reboot\")/pass/" "$root/root/stand-in" >"$root$gate/stand-in"
+printf '#!/bin/sh\nexec %s/gate run "$@"\n' $gate >"$root$gate/apply.py"
+chmod +x "$root/root/example" "$root/root/stand-in" "$root$gate"/*
+
+# Every end that the program can come to, twice: each script sets a port once and the name once.
+interruptions() {
+    while IFS='|' read -r title end back; do
+        for scripts in example:stand-in stand-in:example; do
+            sed "s|@TITLE@|$title|; s|@END@|$end|; s|@BACK@|$back|; s|@PORT_SCRIPT@|${scripts%:*}|
+                s|@NAME_SCRIPT@|${scripts#*:}|" "$here/interrupted.journey"
+        done
+    done
+}
+{
+    cat "$here/service.journey"
+    interruptions <<'TEXT'
+The service is restarted|systemctl restart kestrova-panel|true
+The service is stopped|systemctl stop kestrova-panel|systemctl start kestrova-panel
+The package is upgraded|dpkg -i /root/upgrade.deb|true
+The package is removed|dpkg -r kestrova-panel|dpkg -i /root/upgrade.deb
+The program crashes|pkill -SEGV -x kestrova-panel|true
+The program is killed|pkill -KILL -x kestrova-panel|true
+The panel is unplugged|/root/line unplug|/root/line plug
+TEXT
+    cat "$here/again.journey" "$here/reboot.journey"
+} >"$root/root/all.journey"
 
 # Where no service manager runs, as in an image's build.
 apt='export DEBIAN_FRONTEND=noninteractive; apt-get -q update && apt-get -q -y --no-install-recommends'
@@ -73,16 +108,16 @@ must inside sh -ec '
         "option subnet 255.255.255.0" >/run/udhcpd.conf
     touch /var/lib/misc/udhcpd.leases
     udhcpd /run/udhcpd.conf
-    systemd-run sh -c "panel-emulator --fast --trace /root/trace --journey /root/service.journey \
+    systemd-run sh -c "panel-emulator --fast --trace /root/trace --journey /root/all.journey \
         -- sleep infinity >/root/played 2>&1; systemctl poweroff"'
-must timeout 300 tail -f --pid=$manager /dev/null
+must timeout 900 tail -f --pid=$manager /dev/null
 wait $manager
 [ $? -eq 133 ] || must false "no reboot was asked for: $(cat "$root/root/played")"
 echo "first byte on the line after $((($(head -n 1 "$root/root/trace" | cut -d ' ' -f 1) / 1000 -
     $(cat "$root/root/started")) / 1000)) ms"
 
 boot
-expect "name after the reboot" rack12-monitor-westb "$(inside hostname)"
+expect "name after the reboot" rack12-monitor-wesub "$(inside hostname)"
 must inside dpkg --purge kestrova-panel kestrova-panel-tools
 expect "left behind" "" "$(leftovers)"
 exit $failed
