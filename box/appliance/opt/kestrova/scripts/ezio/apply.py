@@ -8,10 +8,14 @@
 Nothing is ever printed on standard output: the panel program reads the exit status there. It is
 0 when all is applied, 1 when something failed, 2 when the arguments were refused. The reason
 stands in apply.log beside this file, and the configuration files are then as they were.
+
+Only one of these scripts works at a time: a second one, which an operator can start when the panel
+program has been restarted meanwhile, waits for the first.
 """
 
 import argparse
 import contextlib
+import fcntl
 import ipaddress
 import logging
 import os
@@ -21,15 +25,19 @@ import signal
 import socket
 import subprocess
 import sys
+import time
 from pathlib import Path
 
 INTERFACES = Path("/etc/network/interfaces")
 RESOLV_CONF = Path("/etc/resolv.conf")
 HOSTNAME = Path("/etc/hostname")
 LOG = Path(__file__).resolve().parent / "apply.log"
+LOCK = Path("/run/kestrova-apply.lock")
 
 HOST_NAME_MAX = 64  # the kernel's limit
 TOOL_TIMEOUT_S = 20
+LOCK_TIMEOUT_S = 60
+LOCK_LOOK_S = 0.1
 DHCP_DISCOVERS = 3
 DHCP_DISCOVER_PAUSE_S = 2
 
@@ -213,6 +221,29 @@ def run(*command, **environment):
                        timeout=TOOL_TIMEOUT_S, env={**os.environ, **environment})
 
 
+@contextlib.contextmanager
+def no_other_at_work():
+    """Holds the lock for the block. Nothing that the block starts inherits it: a DHCP client would
+    keep it for ever."""
+    with open(LOCK, "ab") as lock:
+        try:
+            fcntl.flock(lock, fcntl.LOCK_EX | fcntl.LOCK_NB)
+        except BlockingIOError:
+            logging.info("waiting: another change is being applied")
+            wait_for_lock(lock)
+        yield
+
+
+def wait_for_lock(lock):
+    give_up = time.monotonic() + LOCK_TIMEOUT_S
+    while time.monotonic() < give_up:
+        time.sleep(LOCK_LOOK_S)
+        with contextlib.suppress(BlockingIOError):
+            fcntl.flock(lock, fcntl.LOCK_EX | fcntl.LOCK_NB)
+            return
+    raise Failed("the other change takes too long")
+
+
 def stop_dhcp_client(port):
     for process in Path("/proc").glob("[0-9]*"):
         with contextlib.suppress(OSError):  # a process may end while it is looked at
@@ -275,10 +306,11 @@ def main(arguments):
     logging.info("asked: %s", " ".join(arguments))
     try:
         settings = parse(arguments)
-        if settings.action == "iface":
-            apply_iface(settings)
-        else:
-            apply_hostname(settings)
+        with no_other_at_work():
+            if settings.action == "iface":
+                apply_iface(settings)
+            else:
+                apply_hostname(settings)
     except Refused as error:
         logging.error("refused: %s", error)
         return 2
