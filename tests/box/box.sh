@@ -1,37 +1,96 @@
 # What the box promises to who starts it, as this user and, for root, as an ordinary user too.
 . "$(dirname "$0")/expect.sh"
 unset PANEL_TTY
-# The box is copied out: an ordinary user may not be able to reach the checkout.
-copy=$(mktemp -d)
+# The box is copied to where everyone may go: an ordinary user may not be able to reach the checkout.
+copy=$(mktemp -d /tmp/box.XXXXXX) || exit 1
 trap 'rm -rf "$copy"' EXIT
 cp -R "$(dirname "$0")/../../box" "$1" "$copy"
-chmod -R a+rX "$copy"
+cp -R "$copy/box/appliance" "$copy/broken"
+chmod -R a+rwX "$copy"
 mkfifo "$copy/fifo"
+cd "$copy" || exit 1
 
 box() { $user "$copy/box/kestrova-panel-box" "$@"; }
 host_state() { hostname; ip -o link | cut -d: -f2; cat /etc/hostname /etc/resolv.conf; }
+# A folder that this user may enter and the box's root may not, where there is such a folder.
+make_private() {
+    rm -rf private
+    mkdir private
+    cp -R box kestrova-panel private
+    [ "$(id -u)" -ne 0 ] || chown -R 65534 private
+    chmod 700 private
+}
 
 for user in "" "setpriv --reuid=65534 --regid=65534 --clear-groups"; do
     [ -z "$user" ] || [ "$(id -u)" -eq 0 ] || continue
     before=$(host_state)
+    make_private
 
     while read -r wanted arguments; do
-        eval "box $arguments" >/dev/null 2>"$copy/said" </dev/null
+        eval "$arguments" >/dev/null 2>said </dev/null
         expect "status of: $arguments" "$wanted" "$?"
-        [ "$wanted" -ne 2 ] || expect "lines for: $arguments" 1 "$(wc -l <"$copy/said")"
+        case $wanted in
+            2 | 125 | 127) expect "lines for: $arguments" 1 "$(wc -l <said)" ;;
+        esac
     done <<'TEXT'
-2
-2    --tty /dev/absent -- true
-2    --no-tty true
-2    --no-tty --appliance / -- true
-2    --enter me -- true
-125  --enter 99999999 -- true
-127  --no-tty -- ./no-such-file
-143  --no-tty -- sh -c 'kill $$'
-150  --no-tty -- "$copy/kestrova-panel"
-1    --no-tty -- touch /usr/x
-1    --no-tty --script-fails -- /opt/kestrova/scripts/ezio/apply.py hostname --hostname a
+2    box
+2    box --tty /dev/absent -- true
+2    box --no-tty true
+2    box --no-tty --appliance / -- true
+2    box --no-tty --script-hangs x -- true
+2    box --enter me -- true
+2    box --enter 1 --no-tty -- true
+125  box --enter 99999999 -- true
+125  box --no-tty -- true <&-
+125  box --no-tty -- "$copy/box/kestrova-panel-box" --no-tty -- true
+127  box --no-tty -- ./no-such-file
+127  box --no-tty -- no-such-command
+143  box --no-tty -- sh -c 'kill $$'
+150  box --no-tty -- ./kestrova-panel
+150  $user private/box/kestrova-panel-box --no-tty -- private/kestrova-panel
+1    box --no-tty -- touch /usr/x
+1    box --no-tty --script-fails -- /opt/kestrova/scripts/ezio/apply.py hostname --hostname a
 TEXT
+
+    # What is wrong with the appliance is said before a box is made of it.
+    while read -r file content; do
+        cp -R "$copy"/box/appliance/. broken
+        printf "$content" >"broken/$file"
+        box --no-tty --appliance broken -- true >/dev/null 2>said
+        expect "status of $file: $content" 125 "$?"
+        expect "lines for $file: $content" 1 "$(grep -c "broken/$file" said)"
+    done <<'TEXT'
+links eth0\n
+links eth0 - dhcp\n
+links eth0 - dhcp 192.0.2.100/24
+links eth0 - pppoe 192.0.2.1/24\n
+links eth0 192.0.2.300/24\n
+links eth0 192.0.2.1/33\n
+links eth0 -\neth0 -
+links lo -
+links eth012345678ab -
+links \377 -
+links bridge0 - dhcp 192.0.2.1/24
+etc/hostname
+etc/hostname two words\n
+etc/hostname \377
+TEXT
+    cp -R "$copy"/box/appliance/. broken
+    printf '# no line feed at the end\neth0 -\neth9 -' >broken/links
+    expect "last port without line feed" "eth0 eth9 lo v-eth0 v-eth9" "$(
+        box --no-tty --appliance broken -- ifconfig -s | awk 'NR > 1 { print $1 }' | xargs)"
+    mkfifo broken/etc/fifo
+    box --no-tty --appliance broken -- true 2>said
+    expect "a pipe among the files" "125 1" "$? $(wc -l <said)"
+    rm broken/etc/fifo
+
+    # The limits are those of the namespace around, not the host's.
+    for kind in user pid mnt net uts ipc; do
+        $user unshare --user --map-root-user sh -c "echo 0 >/proc/sys/user/max_${kind}_namespaces
+            exec box/kestrova-panel-box --no-tty -- true" 2>said
+        expect "$kind namespaces refused" "125 1 user.max_${kind}_namespaces" \
+            "$? $(wc -l <said) $(grep -o 'user.max_[a-z]*_namespaces' said)"
+    done
 
     expect "ports" "bridge0 eth0 eth1 eth2 eth5 " "$(box --no-tty -- ifconfig -s |
         awk 'NR > 1 && !/lo|v/ { printf "%s ", $1 }')"
@@ -45,13 +104,22 @@ TEXT
         /opt/kestrova/scripts/ezio/apply.py hostname --hostname new &
         sleep 60'; echo $?; } | tr '\n' ' ')"
 
-    # The pipe ends when the last process of the box that holds it is gone.
-    $user "$copy/box/kestrova-panel-box" --no-tty -- sleep 1000 >"$copy/fifo" &
+    # The pipe ends when the last process that holds it is gone.
+    $user "$copy/box/kestrova-panel-box" --no-tty -- sleep 1000 >fifo &
     outer=$!
-    exec 3<"$copy/fifo"
+    exec 3<fifo
     expect "entered" rack12-monitor-west "$(box --enter $outer -- hostname)"
     kill -9 $outer
     expect "all ended by a kill" "" "$(timeout 10 cat <&3 || echo no)"
+    exec 3<>fifo
+    for delay in $(seq 0 3 96); do
+        $user "$copy/box/kestrova-panel-box" --no-tty -- sleep 1000 >fifo 2>/dev/null &
+        sleep "0.0$(printf %02d "$delay")"
+        kill -9 $!
+    done
+    exec 4<fifo 3<&-
+    expect "all ended by early kills" "" "$(timeout 10 cat <&4 || echo no)"
+    exec 4<&-
 
     expect "host after all that" "$before" "$(host_state)"
 done
