@@ -1,5 +1,6 @@
 # Compiler and linker settings shared by every target, as the interface library `kestrova-options`.
 
+include(CheckCXXCompilerFlag)
 include(CheckPIESupported)
 check_pie_supported()
 
@@ -13,8 +14,17 @@ if(KESTROVA_SANITIZE)
         -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
     target_link_options(kestrova-options INTERFACE -fsanitize=address,undefined)
 else()
+    # Which of them there are depends on the processor: the fourth is arm64's kind of the third.
+    foreach(flag -fstack-protector-strong -fstack-clash-protection -fcf-protection
+            -mbranch-protection=standard)
+        string(MAKE_C_IDENTIFIER KESTROVA_HAS${flag} accepted)
+        check_cxx_compiler_flag(${flag} ${accepted})
+        if(${accepted})
+            target_compile_options(kestrova-options INTERFACE ${flag})
+        endif()
+    endforeach()
     target_compile_options(kestrova-options INTERFACE
-        -fstack-protector-strong -fstack-clash-protection -fcf-protection -Wformat -Wformat-security
+        -Wformat -Wformat-security
         $<$<NOT:$<CONFIG:Debug>>:-U_FORTIFY_SOURCE -D_FORTIFY_SOURCE=2>)
     target_link_options(kestrova-options INTERFACE -Wl,-z,relro -Wl,-z,now)
 endif()

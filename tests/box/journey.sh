@@ -1,7 +1,7 @@
 # Plays a journey with the real program in the box. The pictures that it takes have to be those of
 # the documentation, byte for byte: EMULATOR PROGRAM JOURNEY.
 cd "$(dirname "$(realpath "$0")")/../.." || exit 1
-taken=$(mktemp -d)
+taken=$(mktemp -d) || exit 1
 trap 'rm -r "$taken"' EXIT
 "$1" --journey "$3" --pictures "$taken" -- box/kestrova-panel-box -- "$2" || exit 1
 for picture in "$taken"/*.svg; do

@@ -1,18 +1,19 @@
 # What an installation from build folder $1, for prefix $2, holds, and that it works where it lies.
 . "$(dirname "$0")/../box/expect.sh"
-work=$(mktemp -d)
+. "$(dirname "$0")/read-only.sh"
+work=$(mktemp -d) || exit 1
 trap 'rm -rf "$work"' EXIT
 prefix=$work$2
 unit=$prefix/lib/systemd/system/kestrova-panel.service
 
-DESTDIR=$work cmake --install "$1" --component program >/dev/null
+DESTDIR=$work read_only "$work" "$1" -- cmake --install "$1" --component program >/dev/null
 expect "programs" kestrova-panel "$(find "$prefix" -type f -perm -1 -exec basename {} +)"
 expect "its path in the service" "$2/sbin/kestrova-panel" "$(sed -n 's/^ExecStart=.* //p' "$unit")"
 expect "the service's faults" "" "$(systemd-analyze verify --man=no "$unit" 2>&1)"
 systemd-analyze security --offline=true --threshold=50 "$unit" >"$work/exposure" 2>&1
 expect "status at an exposure below 5.0" 0 $?
 
-DESTDIR=$work cmake --install "$1" --component tools >/dev/null
+DESTDIR=$work read_only "$work" "$1" -- cmake --install "$1" --component tools >/dev/null
 gunzip -r "$prefix/share/man"
 expect "faults of four manual pages" "4 " "$(find "$prefix/share/man" -type f | wc -l) $(
     mandoc -Tlint -W warning "$prefix"/share/man/man?/*)"
