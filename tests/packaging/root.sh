@@ -4,7 +4,7 @@
 # among the devices is written by hand, in the place of a terminal that the kernel has.
 here=$(dirname "$(realpath "$0")")
 . "$here/../box/expect.sh"
-cached=${XDG_CACHE_HOME:-$HOME/.cache}/kestrova-panel/debian-12
+. "$here/../../scripts/bare-debian.sh"
 work=$(mktemp -d) || exit 1
 root=$work/root
 trap '[ -z "${manager-}" ] || kill -KILL "$(leader)" 2>/dev/null; wait; rm -rf "$work"' EXIT
@@ -36,12 +36,7 @@ leftovers() {
 }
 
 [ "$(id -u)" -eq 0 ] || cannot "root alone can"
-[ -d "$cached" ] || {
-    mkdir -p "${cached%/*}"
-    debootstrap --variant=minbase --include=systemd-sysv,iproute2,ifupdown bookworm "$root" \
-        >"$work/log" 2>&1 && mv "$root" "$cached" || { cat "$work/log"; cannot "debootstrap failed"; }
-}
-cp -a "$cached" "$root"
+bare_debian "$root" debian-12 --include=systemd-sysv,iproute2,ifupdown || cannot "debootstrap failed"
 cp "$1"/*.deb "$here/line" "$root/root"
 dpkg-deb -R "$1"/kestrova-panel_*.deb "$work/upgrade"
 sed -i '/^Version:/s/$/.1/' "$work/upgrade/DEBIAN/control"

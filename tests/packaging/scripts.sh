@@ -9,6 +9,7 @@ trap 'rm -rf "$work"' EXIT
 # Without their temporary folder they say one line and end: the next thing could be the host's.
 for script in tests/box/box.sh tests/box/journey.sh tests/emulator/panel-emulator.sh \
     tests/packaging/files.sh tests/packaging/builds.sh tests/packaging/scripts.sh \
+    tests/packaging/root.sh \
     scripts/demo scripts/package scripts/test scripts/test-fresh scripts/test-packages; do
     TMPDIR=/nonexistent read_only -- timeout 30 sh $script >"$work/said" 2>&1
     expect "$script without a temporary folder" "1 1 1" \
