@@ -81,7 +81,8 @@ void Line::collect() {
     if (answersRead_ != answersWritten_ && backlog_.size() < backlogBytes) {
         pollfd unread{slave_.get(), POLLIN, 0};
         const bool nothing = poll(&unread, 1, 0) == 0;
-        // A line that was hung up has forgotten what was unread, and this end has to be opened anew.
+        // A line that was hung up has forgotten what was unread, and this end has to be opened
+        // anew.
         const bool hungUp = (unread.revents & POLLHUP) != 0;
         if (hungUp)
             slave_ = FileDescriptor(open(path_.c_str(), O_RDWR | O_NOCTTY | O_CLOEXEC));
