@@ -10,6 +10,8 @@ DESTDIR=$work read_only "$work" "$1" -- cmake --install "$1" --component program
 expect "programs" kestrova-panel "$(find "$prefix" -type f -perm -1 -exec basename {} +)"
 expect "its path in the service" "$2/sbin/kestrova-panel" "$(sed -n 's/^ExecStart=.* //p' "$unit")"
 expect "the service's faults" "" "$(systemd-analyze verify --man=no "$unit" 2>&1)"
+expect "rights that the script is said not to have" "" \
+    "$(grep -oE 'CAP_(SETUID|SETGID|KILL|SYS_CHROOT)' "$unit")"
 systemd-analyze security --offline=true --threshold=50 "$unit" >"$work/exposure" 2>&1
 expect "status at an exposure below 5.0" 0 $?
 
