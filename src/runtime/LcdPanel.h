@@ -1,24 +1,28 @@
 #pragma once
 
+#include "runtime/HeldKeys.h"
 #include "runtime/KeyCode.h"
+#include "runtime/Marquee.h"
+#include "runtime/SerialLine.h"
 #include "runtime/String.h"
+#include "runtime/onlyOne.h"
 
 #include <cstdint>
 #include <string>
 
-/// The front panel on its serial line: two rows of 40 columns, of which 16 are visible, and four
-/// keys. The one object opens and configures the line and lives until the process ends.
-///
-/// The line is never waited for when writing: what cannot be written is lost, silently.
+/// The front panel: a display, whose lower row can scroll, and four keys. The one object opens the
+/// serial line and lives until the process ends.
 class LcdPanel {
   public:
+    static constexpr int rows = 2;
+    static constexpr int columns = 40;        ///< of a row, as the cursor counts
+    static constexpr int visibleColumns = 16; ///< the first of them
+
     /// The one panel. The first call opens and configures the line and clears the display; it ends
     /// the process with status 150 when the line cannot be configured.
-    static LcdPanel *instance();
-
-    LcdPanel(const LcdPanel &) = delete;
-    LcdPanel &operator=(const LcdPanel &) = delete;
-    ~LcdPanel();
+    static LcdPanel *instance() {
+        return onlyOne([] { return new LcdPanel; });
+    }
 
     /// Sends the prefix and one command byte. -1 when the prefix could not be written (the command
     /// is then held back), else what writing the command byte gave.
@@ -32,9 +36,9 @@ class LcdPanel {
     void cursorBlinkOn();
     void cursorOff();
 
-    /// Clears the display and writes the first two lines of `text`, each padded or cut to 16
-    /// columns. The second line, whole, becomes the marquee. Returns by how many characters the
-    /// second line is too long for its row, 0 when it fits.
+    /// Clears the display and writes the first two lines of `text`, each padded or cut to the
+    /// visible columns. The second line, whole, becomes the marquee. Returns by how many characters
+    /// the second line is too long for its row, 0 when it fits.
     int showText(QLX::String<char> text);
     /// Writes at the cursor and leaves the cursor on the last character written, not behind it, so
     /// that a blinking cursor marks that character.
@@ -50,31 +54,22 @@ class LcdPanel {
     /// short or garbled answer counts as no key; a backlog of answers yields one key.
     KeyCode pollKey();
     /// Counts one poll that reported `key`, without asking the panel.
-    void countKey(KeyCode key);
+    void countKey(KeyCode key) { heldKeys.count(key); }
     /// True on the second to the fifth consecutive poll that reported `key`.
-    bool isHeldShort(KeyCode key) const;
+    [[nodiscard]] bool isHeldShort(KeyCode key) const { return heldKeys.isHeldShort(key); }
     /// True from the sixth consecutive poll on.
-    bool isHeldLong(KeyCode key) const;
+    [[nodiscard]] bool isHeldLong(KeyCode key) const { return heldKeys.isHeldLong(key); }
 
   private:
     LcdPanel();
 
-    void configureLine();
-    void send(const char *bytes, std::size_t length);
+    void writeRow(const std::string &text);
     void drawMarquee();
-    std::int32_t lastMarqueeOffset() const;
-    std::uint32_t pollsHeld(KeyCode key) const;
 
-    int fd;
-    std::int32_t commandPrefix;
-    std::uint32_t upHeld = 0; // these four: consecutive polls, at most one of them not 0
-    std::uint32_t downHeld = 0;
-    std::uint32_t escapeHeld = 0;
-    std::uint32_t enterHeld = 0;
-    std::string marqueeText;
-    std::int32_t marqueeOffset = 0;
-
-    static LcdPanel *theInstance;
+    SerialLine line;
+    std::int32_t commandPrefix; ///< its low byte is sent
+    HeldKeys heldKeys;
+    Marquee marquee;
 };
 
 /// True from the second consecutive poll that reported `key` on: a handler that does nothing then

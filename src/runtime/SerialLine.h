@@ -1,0 +1,31 @@
+#pragma once
+
+#include <array>
+#include <chrono>
+#include <cstdint>
+#include <sys/types.h>
+
+/// The serial line to the panel, `/dev/ttyS1`: raw bytes at 2400 baud.
+///
+/// The line is never waited for when writing: what cannot be written is lost, silently.
+class SerialLine {
+  public:
+    /// What one look at the line has brought; 0 where nothing came.
+    using Received = std::array<std::uint8_t, 256>;
+
+    /// Opens and configures the line. Ends the process with status 150 when it cannot be
+    /// configured. A line that cannot be opened is not noticed: writing and reading then fail.
+    SerialLine();
+    ~SerialLine();
+    SerialLine(const SerialLine &) = delete;
+    SerialLine &operator=(const SerialLine &) = delete;
+
+    /// What `write` returns: -1 when nothing could be written.
+    ssize_t send(const void *bytes, std::size_t length);
+
+    /// Waits until bytes come, at most `timeout` or until a signal, and takes those that are there.
+    Received receive(std::chrono::milliseconds timeout);
+
+  private:
+    int fd;
+};
