@@ -2,9 +2,9 @@
 
 #include "hostname/HostnameEditMenu.h"
 #include "runtime/LcdPanel.h"
+#include "runtime/configurationScript.h"
 #include "runtime/confirmationText.h"
 #include "runtime/leaveScreen.h"
-#include "runtime/runCommand.h"
 #include "status/MainMenu.h"
 
 #include <unistd.h>
@@ -36,11 +36,8 @@ bool HostnameApplyMenu::isValidHostname() const {
     return hostname.front() != '-' && hostname.back() != '-' && !isDigit(hostname.front());
 }
 
-// In the background: the script ends by rebooting the appliance, and there is nothing to wait for.
 void HostnameApplyMenu::applyHostname() {
-    const std::string command =
-        "/opt/kestrova/scripts/ezio/apply.py hostname --hostname " + hostname;
-    runCommand(command.c_str(), false);
+    configureHostname(hostname);
     hostname.clear();
 }
 

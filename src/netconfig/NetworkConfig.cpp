@@ -1,7 +1,7 @@
 #include "netconfig/NetworkConfig.h"
 
 #include "runtime/beginsWith.h"
-#include "runtime/runCommand.h"
+#include "runtime/configurationScript.h"
 
 #include <fstream>
 #include <utility>
@@ -78,10 +78,7 @@ std::string NetworkConfig::apply() const {
     if (options.empty())
         return "Unknown";
 
-    // The runner does not report exit statuses, so the shell prints the script's.
-    const std::string command =
-        "/opt/kestrova/scripts/ezio/apply.py iface --name " + name + options + ";echo $?";
-    return beginsWith(runCommand(command.c_str(), true), "0") ? "" : "Check Logfile";
+    return configurePort(name, options) ? "" : "Check Logfile";
 }
 
 std::string NetworkConfig::staticOptions() const {

@@ -21,20 +21,20 @@ class NetworkConfig {
     /// a message that fits a row of the panel; settings that cannot work are refused unasked.
     std::string apply() const;
 
-    std::string getName() const { return name; }
-    std::string getAddress() const { return address; }
-    std::string getNetmask() const { return netmask; }
-    std::string getGateway() const { return gateway; }
+    [[nodiscard]] std::string getName() const { return name; }
+    [[nodiscard]] std::string getAddress() const { return address; }
+    [[nodiscard]] std::string getNetmask() const { return netmask; }
+    [[nodiscard]] std::string getGateway() const { return gateway; }
     void setAddress(const std::string &text) { address = text; }
     void setNetmask(const std::string &text) { netmask = text; }
     void setGateway(const std::string &text) { gateway = text; }
 
-    bool isDhcp() const { return dhcp; }
+    [[nodiscard]] bool isDhcp() const { return dhcp; }
     void setDhcp(bool enabled) { dhcp = enabled; }
 
-    std::int32_t getDnsCount() const;
+    [[nodiscard]] std::int32_t getDnsCount() const;
     /// "" for a position that is not below the count.
-    std::string getDns(std::uint32_t position) const;
+    [[nodiscard]] std::string getDns(std::uint32_t position) const;
     /// Does nothing for a position that is not below the count.
     void setDns(std::uint32_t position, const std::string &text);
     /// Does nothing for a position that is not below the count.
@@ -42,7 +42,7 @@ class NetworkConfig {
     /// Appends a server; ignores an address that is not set.
     void addDns(const std::string &text);
 
-    static bool isAddressSet(const std::string &text);
+    [[nodiscard]] static bool isAddressSet(const std::string &text);
 
   private:
     bool loadStanza();
