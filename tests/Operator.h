@@ -5,6 +5,7 @@
 
 #include "runtime/KeyCode.h"
 #include "runtime/MainLoop.h"
+#include "status/MainMenu.h"
 
 #include <gtest/gtest.h>
 
@@ -14,7 +15,7 @@ void standardAppliance(World &appliance);
 class Operator {
   public:
     /// Starts the program on the world as it is now.
-    Operator() : loop(running = new MainLoop) {}
+    Operator() : loop(running = new MainLoop(MainMenu::instance, MainMenu::requestRefresh)) {}
 
     void poll(KeyCode key = keyNone);       ///< one turn, with this key down or none
     void hold(KeyCode key, int polls);      ///< that many turns with the key down, then release

@@ -2,27 +2,27 @@
 
 #include "runtime/LcdPanel.h"
 #include "runtime/MenuContext.h"
-#include "status/MainMenu.h"
+#include "runtime/pauseFor.h"
 
 #include <csignal>
-#include <unistd.h>
 
 namespace {
 
-constexpr useconds_t turnPauseUs = 100000;
+constexpr std::chrono::milliseconds turnPause{100};
 
-// The request is a flag that needs no object: the signal may come before the main menu exists, or
-// while its constructor is waiting for a command, where building a second one would deadlock.
-void requestRefresh(int) {
-    MainMenu::requestRefresh();
+void (*refreshRequest)() = nullptr;
+
+void onRefreshSignal(int) {
+    refreshRequest();
 }
 
 } // namespace
 
-MainLoop::MainLoop() {
-    signal(SIGUSR1, requestRefresh);
+MainLoop::MainLoop(const std::function<Menu *()> &firstScreen, void (*requestRefresh)()) {
+    refreshRequest = requestRefresh;
+    signal(SIGUSR1, onRefreshSignal);
     panel = LcdPanel::instance(); // opened long since, by an initialiser
-    context = new MenuContext(MainMenu::instance());
+    context = new MenuContext(firstScreen());
 }
 
 void MainLoop::turn() {
@@ -43,5 +43,5 @@ void MainLoop::turn() {
         break;
     }
     context->display();
-    usleep(turnPauseUs);
+    pauseFor(turnPause);
 }

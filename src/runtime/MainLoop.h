@@ -1,13 +1,18 @@
 #pragma once
 
+#include <functional>
+
 class LcdPanel;
+class Menu;
 class MenuContext;
 
 /// The program's spine: one key, one drawing, one short sleep, for ever.
 class MainLoop {
   public:
-    /// Installs the `SIGUSR1` handler and makes the status pages the current screen.
-    MainLoop();
+    /// Has every `SIGUSR1` call `requestRefresh`, and then makes what `firstScreen` returns the
+    /// current screen: the signal may come while the first screen is still being built. Whatever
+    /// `requestRefresh` does has to be safe in a signal handler at that time already.
+    MainLoop(const std::function<Menu *()> &firstScreen, void (*requestRefresh)());
 
     /// One turn: waits at most 500 ms for a key, hands it to the current screen, lets the screen
     /// that is current then draw, and sleeps 100 ms. A signal cuts either wait short.

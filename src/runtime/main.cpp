@@ -1,7 +1,0 @@
-#include "runtime/MainLoop.h"
-
-int main() {
-    MainLoop loop;
-    for (;;)
-        loop.turn();
-}
