@@ -3,26 +3,18 @@
 #include "editors/IfaceStaticEditDNSMenu.h"
 #include "editors/IfaceStaticListDNSMenu.h"
 #include "netconfig/NetworkConfig.h"
+#include "parts/drawMarkers.h"
+#include "parts/keyFilters.h"
 #include "runtime/LcdPanel.h"
-#include "runtime/drawMarkers.h"
-#include "runtime/leaveScreen.h"
-
-IfaceStaticDNSActionMenu *IfaceStaticDNSActionMenu::theInstance = nullptr;
-
-IfaceStaticDNSActionMenu *IfaceStaticDNSActionMenu::instance() {
-    if (theInstance == nullptr)
-        theInstance = new IfaceStaticDNSActionMenu;
-    return theInstance;
-}
 
 void IfaceStaticDNSActionMenu::display(MenuContext *) {
-    if (drawn)
+    if (!drawn.isDue())
         return;
-    drawn = true;
     panel->showText("  Edit Svr\n  Delete Svr");
     drawMarkers(panel, deleteSelected ? 1 : 0);
 }
 
+// Up and Down have no hold filter: the marker stops at once, so a held key has nothing to repeat.
 void IfaceStaticDNSActionMenu::onUp(MenuContext *) {
     if (deleteSelected)
         select(false);
@@ -39,16 +31,16 @@ void IfaceStaticDNSActionMenu::select(bool deletion) {
 }
 
 void IfaceStaticDNSActionMenu::onEscape(MenuContext *context) {
-    if (isHeld(panel, keyEscape))
+    if (!actsOncePerPress(panel, keyEscape))
         return;
     deleteSelected = false;
-    leaveScreen(this, drawn, context, IfaceStaticListDNSMenu::instance());
+    drawn.leaveFor(context, IfaceStaticListDNSMenu::instance());
 }
 
 void IfaceStaticDNSActionMenu::onEnter(MenuContext *context) {
-    if (isHeld(panel, keyEnter))
+    if (!actsOncePerPress(panel, keyEnter))
         return;
-    leaveScreen(this, drawn, context, deleteSelected ? deleteServer() : editServer());
+    drawn.leaveFor(context, deleteSelected ? deleteServer() : editServer());
 }
 
 Menu *IfaceStaticDNSActionMenu::deleteServer() {

@@ -1,12 +1,16 @@
 #pragma once
 
 #include "editors/EditedAddress.h"
+#include "parts/DrawnOnce.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 /// Asks whether a DNS server is to be edited or deleted. A deletion is not asked about again.
 class IfaceStaticDNSActionMenu : public Menu {
   public:
-    static IfaceStaticDNSActionMenu *instance();
+    static IfaceStaticDNSActionMenu *instance() {
+        return onlyOne([] { return new IfaceStaticDNSActionMenu; });
+    }
 
     /// Not owned. To be called before the screen is made current.
     void setConfig(NetworkConfig *settings) { config = settings; }
@@ -26,10 +30,8 @@ class IfaceStaticDNSActionMenu : public Menu {
     Menu *deleteServer();
     Menu *editServer();
 
-    bool drawn = false;
+    DrawnOnce drawn{this};
     NetworkConfig *config = nullptr;
     ServerIndex serverIndex = noServer;
     bool deleteSelected = false;
-
-    static IfaceStaticDNSActionMenu *theInstance;
 };

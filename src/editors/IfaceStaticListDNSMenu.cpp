@@ -4,19 +4,20 @@
 #include "editors/IfaceStaticDNSActionMenu.h"
 #include "netconfig/IfaceStaticMenu.h"
 #include "netconfig/NetworkConfig.h"
+#include "parts/keyFilters.h"
 #include "runtime/LcdPanel.h"
-#include "runtime/drawMarkers.h"
-#include "runtime/leaveScreen.h"
 
 #include <algorithm>
 
-IfaceStaticListDNSMenu *IfaceStaticListDNSMenu::theInstance = nullptr;
+namespace {
 
-IfaceStaticListDNSMenu *IfaceStaticListDNSMenu::instance() {
-    if (theInstance == nullptr)
-        theInstance = new IfaceStaticListDNSMenu;
-    return theInstance;
+std::string padded(std::string server) {
+    Octets octets{};
+    parseDottedQuad(server, octets);
+    return formatDottedQuad(octets, true);
 }
+
+} // namespace
 
 void IfaceStaticListDNSMenu::readServers() {
     serverCount = config->getDnsCount();
@@ -32,80 +33,47 @@ std::string IfaceStaticListDNSMenu::renderList() const {
     if (serverCount == 0)
         return "No DNS Svr found";
 
-    const auto padded = [this](std::int32_t index) {
-        std::string server = servers.at(static_cast<std::size_t>(index));
-        Octets octets{};
-        parseDottedQuad(server, octets);
-        return formatDottedQuad(octets, true);
-    };
-    const bool hasSecondRow = topIndex + 1 < storedCount();
-    if (!hasSecondRow)
-        return ">" + padded(topIndex);
-    return (cursorRow == 0 ? ">" : " ") + padded(topIndex) + "\n" + (cursorRow == 0 ? " " : ">") +
-           padded(topIndex + 1);
-}
-
-void IfaceStaticListDNSMenu::redrawList() {
-    panel->showText(renderList());
-}
-
-void IfaceStaticListDNSMenu::moveMarkerTo(std::uint8_t row) {
-    drawMarkers(panel, row);
-    cursorRow = row;
-}
-
-void IfaceStaticListDNSMenu::selectFirstServer() {
-    topIndex = 0;
-    cursorRow = 0;
+    std::string text;
+    for (int row = 0; row < LcdPanel::rows && window.entryOn(row) < storedCount(); ++row) {
+        const auto &server = servers.at(static_cast<std::size_t>(window.entryOn(row)));
+        text += (row > 0 ? "\n" : "") + (window.marker(row) + padded(server));
+    }
+    return text;
 }
 
 void IfaceStaticListDNSMenu::display(MenuContext *) {
-    if (drawn)
-        return;
-    drawn = true;
-    if (config == nullptr)
+    if (!drawn.isDue() || config == nullptr)
         return;
     readServers();
-    // The last server or a place past it: whoever was there starts again at the first.
-    if (topIndex + cursorRow >= serverCount - 1)
-        selectFirstServer();
-    redrawList();
+    // The last server or a place past it: whoever was there starts again at the first, and is not
+    // left on a server that has just moved up into the place of a deleted one.
+    if (window.selected() >= serverCount - 1)
+        window.selectFirst();
+    panel->showText(renderList());
 }
 
 void IfaceStaticListDNSMenu::onUp(MenuContext *) {
-    if (panel->isHeldShort(keyUp) || serverCount < 1)
-        return;
-    if (cursorRow == 1) {
-        moveMarkerTo(0);
-    } else if (topIndex > 0) {
-        --topIndex;
-        redrawList();
-    }
+    if (actsRestsAndRepeats(panel, keyUp) && window.up())
+        panel->showText(renderList());
 }
 
 void IfaceStaticListDNSMenu::onDown(MenuContext *) {
-    if (panel->isHeldShort(keyDown) || serverCount < 2)
-        return;
-    if (cursorRow == 0) {
-        moveMarkerTo(1);
-    } else if (topIndex + 2 < storedCount()) {
-        ++topIndex;
-        redrawList();
-    }
+    if (actsRestsAndRepeats(panel, keyDown) && window.down(storedCount()))
+        panel->showText(renderList());
 }
 
 void IfaceStaticListDNSMenu::onEscape(MenuContext *context) {
-    if (isHeld(panel, keyEscape))
+    if (!actsOncePerPress(panel, keyEscape))
         return;
-    selectFirstServer();
-    leaveScreen(this, drawn, context, IfaceStaticMenu::instance());
+    window.selectFirst();
+    drawn.leaveFor(context, IfaceStaticMenu::instance());
 }
 
 void IfaceStaticListDNSMenu::onEnter(MenuContext *context) {
-    if (isHeld(panel, keyEnter) || serverCount < 1)
+    if (!actsOncePerPress(panel, keyEnter) || serverCount < 1)
         return;
     auto *actions = IfaceStaticDNSActionMenu::instance();
     actions->setConfig(config);
-    actions->setServerIndex(topIndex + cursorRow);
-    leaveScreen(this, drawn, context, actions);
+    actions->setServerIndex(window.selected());
+    drawn.leaveFor(context, actions);
 }

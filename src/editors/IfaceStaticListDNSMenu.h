@@ -1,6 +1,9 @@
 #pragma once
 
+#include "parts/DrawnOnce.h"
+#include "parts/ListWindow.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 #include <array>
 #include <cstdint>
@@ -12,10 +15,15 @@ class NetworkConfig;
 /// the first ten can be reached from the panel.
 class IfaceStaticListDNSMenu : public Menu {
   public:
-    static IfaceStaticListDNSMenu *instance();
+    static IfaceStaticListDNSMenu *instance() {
+        return onlyOne([] { return new IfaceStaticListDNSMenu; });
+    }
 
     /// Not owned. To be called before the screen is made current.
     void setConfig(NetworkConfig *settings) { config = settings; }
+
+    /// The servers in the window, with the marker in front of them.
+    [[nodiscard]] std::string renderList() const;
 
     void display(MenuContext *context) override;
     void onUp(MenuContext *context) override;
@@ -27,18 +35,11 @@ class IfaceStaticListDNSMenu : public Menu {
     IfaceStaticListDNSMenu() = default;
 
     void readServers();
-    std::int32_t storedCount() const;
-    std::string renderList() const;
-    void redrawList();
-    void moveMarkerTo(std::uint8_t row);
-    void selectFirstServer();
+    [[nodiscard]] std::int32_t storedCount() const;
 
-    bool drawn = false;
+    DrawnOnce drawn{this};
     NetworkConfig *config = nullptr;
     std::array<std::string, 10> servers;
     std::int32_t serverCount = 0; ///< as the settings reported it; may exceed what is stored
-    std::int32_t topIndex = 0;    ///< server on row 0
-    std::uint8_t cursorRow = 0;   ///< the selected server is `topIndex + cursorRow`
-
-    static IfaceStaticListDNSMenu *theInstance;
+    ListWindow window{panel};
 };

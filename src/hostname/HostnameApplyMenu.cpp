@@ -1,31 +1,22 @@
 #include "hostname/HostnameApplyMenu.h"
 
 #include "hostname/HostnameEditMenu.h"
+#include "parts/confirmationText.h"
+#include "parts/keyFilters.h"
+#include "parts/showFor.h"
 #include "runtime/LcdPanel.h"
 #include "runtime/configurationScript.h"
-#include "runtime/confirmationText.h"
-#include "runtime/leaveScreen.h"
 #include "status/MainMenu.h"
-
-#include <unistd.h>
 
 namespace {
 
-constexpr useconds_t errorPauseUs = 2000000;
+constexpr std::chrono::seconds errorTime{2};
 
 bool isDigit(char character) {
     return character >= '0' && character <= '9';
 }
 
 } // namespace
-
-HostnameApplyMenu *HostnameApplyMenu::theInstance = nullptr;
-
-HostnameApplyMenu *HostnameApplyMenu::instance() {
-    if (theInstance == nullptr)
-        theInstance = new HostnameApplyMenu;
-    return theInstance;
-}
 
 void HostnameApplyMenu::setHostname(const std::string &name) {
     hostname = name;
@@ -41,25 +32,18 @@ void HostnameApplyMenu::applyHostname() {
     hostname.clear();
 }
 
-void HostnameApplyMenu::refuse(const char *error, MenuContext *context) {
-    panel->showText(error);
-    usleep(errorPauseUs);
-    leaveScreen(this, drawn, context, HostnameEditMenu::instance());
-}
-
 void HostnameApplyMenu::display(MenuContext *) {
-    if (drawn)
-        return;
-    drawn = true;
-    panel->showText(confirmationText);
+    if (drawn.isDue())
+        panel->showText(confirmationText);
 }
 
+// No hold filter: the screen is left at once, and an Escape that goes on does no harm to the pages.
 void HostnameApplyMenu::onEscape(MenuContext *context) {
-    leaveScreen(this, drawn, context, MainMenu::instance());
+    drawn.leaveFor(context, MainMenu::instance());
 }
 
 void HostnameApplyMenu::onEnter(MenuContext *context) {
-    if (isHeld(panel, keyEnter))
+    if (!actsOncePerPress(panel, keyEnter))
         return;
     if (hostname.empty()) {
         refuse("Error\nEmpty Hostname", context);
@@ -69,4 +53,9 @@ void HostnameApplyMenu::onEnter(MenuContext *context) {
         applyHostname();
         panel->showText("Rebooting\nappliance...");
     }
+}
+
+void HostnameApplyMenu::refuse(const char *error, MenuContext *context) {
+    showFor(panel, errorTime, error);
+    drawn.leaveFor(context, HostnameEditMenu::instance());
 }

@@ -1,7 +1,9 @@
 #pragma once
 
+#include "parts/DrawnOnce.h"
 #include "runtime/Menu.h"
 #include "runtime/String.h"
+#include "runtime/onlyOne.h"
 
 #include <string>
 
@@ -9,7 +11,9 @@
 /// set a good one, which reboots the appliance.
 class HostnameApplyMenu : public Menu {
   public:
-    static HostnameApplyMenu *instance();
+    static HostnameApplyMenu *instance() {
+        return onlyOne([] { return new HostnameApplyMenu; });
+    }
 
     /// Takes the name without the blanks around it. To be called before the screen is made current.
     void setHostname(const std::string &name);
@@ -18,15 +22,17 @@ class HostnameApplyMenu : public Menu {
     void onEscape(MenuContext *context) override;
     void onEnter(MenuContext *context) override;
 
+    /// Neither begins nor ends with a hyphen, and does not begin with a digit. For a name that is
+    /// not empty.
+    [[nodiscard]] bool isValidHostname() const;
+    /// Starts the configuration script, and forgets the name: a further Enter applies nothing.
+    void applyHostname();
+
   private:
     HostnameApplyMenu() = default;
 
-    bool isValidHostname() const;
-    void applyHostname();
     void refuse(const char *error, MenuContext *context);
 
-    bool drawn = false;
+    DrawnOnce drawn{this};
     QLX::String<char> hostname;
-
-    static HostnameApplyMenu *theInstance;
 };

@@ -1,8 +1,8 @@
 #include "hostname/HostnameEditMenu.h"
 
 #include "hostname/HostnameApplyMenu.h"
+#include "parts/keyFilters.h"
 #include "runtime/LcdPanel.h"
-#include "runtime/leaveScreen.h"
 #include "runtime/runCommand.h"
 #include "status/MainMenu.h"
 
@@ -15,25 +15,16 @@ const std::string hostnameAlphabet =
 constexpr std::int32_t hyphenIndex = 62; // the last
 
 constexpr char blank = ' '; // a position without a character
-constexpr std::size_t bufferLength = 40;
+constexpr std::size_t bufferLength = LcdPanel::columns;
 constexpr std::int32_t lastPosition = bufferLength - 1;
+constexpr std::int32_t lastVisiblePosition = LcdPanel::visibleColumns - 1;
 constexpr int nameRow = 1;
-constexpr std::int32_t visibleColumns = 16;
 
 } // namespace
 
-HostnameEditMenu *HostnameEditMenu::theInstance = nullptr;
-
-HostnameEditMenu *HostnameEditMenu::instance() {
-    if (theInstance == nullptr)
-        theInstance = new HostnameEditMenu;
-    return theInstance;
-}
-
 void HostnameEditMenu::display(MenuContext *) {
-    if (drawn)
+    if (!drawn.isDue())
         return;
-    drawn = true;
     hostname = runCommand("hostname", true);
     if (!hostname.empty())
         hostname.pop_back(); // the line feed
@@ -51,32 +42,30 @@ void HostnameEditMenu::display(MenuContext *) {
 }
 
 void HostnameEditMenu::onUp(MenuContext *) {
-    if (panel->isHeldShort(keyUp))
-        return;
-    putLetter(charIndex > 0 ? charIndex - 1 : hyphenIndex);
+    if (actsRestsAndRepeats(panel, keyUp))
+        putLetter(charIndex > 0 ? charIndex - 1 : hyphenIndex);
 }
 
 void HostnameEditMenu::onDown(MenuContext *) {
-    if (panel->isHeldShort(keyDown))
-        return;
-    putLetter(charIndex < hyphenIndex ? charIndex + 1 : 0);
+    if (actsRestsAndRepeats(panel, keyDown))
+        putLetter(charIndex < hyphenIndex ? charIndex + 1 : 0);
 }
 
 void HostnameEditMenu::onEscape(MenuContext *context) {
-    if (panel->isHeldShort(keyEscape))
+    if (!actsRestsAndRepeats(panel, keyEscape))
         return;
     if (panel->isHeldLong(keyEscape)) {
         eraseAll();
     } else if (cursorPos == 0) {
         panel->cursorOff();
-        leaveScreen(this, drawn, context, MainMenu::instance());
+        drawn.leaveFor(context, MainMenu::instance());
     } else {
         eraseAndStepBack();
     }
 }
 
 void HostnameEditMenu::onEnter(MenuContext *context) {
-    if (panel->isHeldShort(keyEnter))
+    if (!actsRestsAndRepeats(panel, keyEnter))
         return;
     if (panel->isHeldLong(keyEnter) || characterUnderCursor() == blank) {
         finish(context);
@@ -120,7 +109,7 @@ void HostnameEditMenu::eraseAndStepBack() {
     panel->cursorLeft();
     --cursorPos;
     findCharacterUnderCursor();
-    if (cursorPos >= visibleColumns - 1) {
+    if (cursorPos >= lastVisiblePosition) {
         panel->setMarqueeText(hostname);
         panel->scrollMarqueeBackward();
     }
@@ -131,7 +120,7 @@ void HostnameEditMenu::stepOn() {
     panel->cursorRight();
     ++cursorPos;
     charIndex = hyphenIndex;
-    if (cursorPos >= visibleColumns) {
+    if (cursorPos > lastVisiblePosition) {
         panel->setMarqueeText(hostname);
         panel->scrollMarqueeForward();
     }
@@ -140,5 +129,5 @@ void HostnameEditMenu::stepOn() {
 void HostnameEditMenu::finish(MenuContext *context) {
     HostnameApplyMenu::instance()->setHostname(hostname);
     panel->cursorOff();
-    leaveScreen(this, drawn, context, HostnameApplyMenu::instance());
+    drawn.leaveFor(context, HostnameApplyMenu::instance());
 }

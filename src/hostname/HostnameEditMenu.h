@@ -1,6 +1,8 @@
 #pragma once
 
+#include "parts/DrawnOnce.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 #include <cstdint>
 #include <string>
@@ -11,7 +13,9 @@
 /// and at the first position leaves. Every visit starts from the name that the system has.
 class HostnameEditMenu : public Menu {
   public:
-    static HostnameEditMenu *instance();
+    static HostnameEditMenu *instance() {
+        return onlyOne([] { return new HostnameEditMenu; });
+    }
 
     void display(MenuContext *context) override;
     void onUp(MenuContext *context) override;
@@ -30,10 +34,8 @@ class HostnameEditMenu : public Menu {
     void stepOn();
     void finish(MenuContext *context);
 
-    bool drawn = false;
+    DrawnOnce drawn{this};
     std::int32_t charIndex = -1; ///< in the alphabet; -1 for a character that is not in it
     std::string hostname;        ///< 40 characters once drawn: the name, then blanks
     std::int32_t cursorPos = 0;  ///< 0 to 39
-
-    static HostnameEditMenu *theInstance;
 };

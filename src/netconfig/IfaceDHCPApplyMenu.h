@@ -1,6 +1,8 @@
 #pragma once
 
+#include "parts/DrawnOnce.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 class NetworkConfig;
 
@@ -8,7 +10,9 @@ class NetworkConfig;
 /// back to the status pages: there the port shows whether it got an address.
 class IfaceDHCPApplyMenu : public Menu {
   public:
-    static IfaceDHCPApplyMenu *instance();
+    static IfaceDHCPApplyMenu *instance() {
+        return onlyOne([] { return new IfaceDHCPApplyMenu; });
+    }
 
     /// Not owned. To be called before the screen is made current.
     void setConfig(NetworkConfig *settings) { config = settings; }
@@ -20,8 +24,6 @@ class IfaceDHCPApplyMenu : public Menu {
   private:
     IfaceDHCPApplyMenu() = default;
 
-    bool drawn = false;
+    DrawnOnce drawn{this};
     NetworkConfig *config = nullptr;
-
-    static IfaceDHCPApplyMenu *theInstance;
 };

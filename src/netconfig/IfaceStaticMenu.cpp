@@ -7,155 +7,93 @@
 #include "editors/IfaceStaticListDNSMenu.h"
 #include "netconfig/IfaceTypeMenu.h"
 #include "netconfig/NetworkConfig.h"
+#include "parts/keyFilters.h"
+#include "parts/showFor.h"
 #include "runtime/LcdPanel.h"
-#include "runtime/drawMarkers.h"
-#include "runtime/leaveScreen.h"
 #include "status/MainMenu.h"
 
-#include <unistd.h>
+#include <iterator>
+
+struct IfaceStaticMenu::Item {
+    const char *label;
+    void (IfaceStaticMenu::*enter)(MenuContext *context);
+};
+
+const IfaceStaticMenu::Item IfaceStaticMenu::items[] = {
+    {"Set IP Addr", &IfaceStaticMenu::openScreen<IfaceStaticEditIPMenu>},
+    {"Set Netmask", &IfaceStaticMenu::openScreen<IfaceStaticEditNMMenu>},
+    {"Set Gateway", &IfaceStaticMenu::openScreen<IfaceStaticEditGWMenu>},
+    {"Add DNS Svr", &IfaceStaticMenu::openScreen<IfaceStaticEditDNSMenu>},
+    {"Lst DNS Svrs", &IfaceStaticMenu::openScreen<IfaceStaticListDNSMenu>},
+    {"Apply Changes", &IfaceStaticMenu::applyChanges},
+};
 
 namespace {
 
-enum Item : std::int32_t { setAddress, setNetmask, setGateway, addDns, listDns, applyItem };
+constexpr std::size_t labelColumns = 13; // between the marker with its blank and the indicator
+static_assert(2 + labelColumns + 1 == LcdPanel::visibleColumns);
 
-constexpr std::int32_t lastTopItem = 4;
-constexpr std::size_t labelColumns = 13;
-constexpr useconds_t errorPauseUs = 3000000;
-
-// Hands the settings to the screen that works on them next.
-template <typename Screen> Menu *screenFor(NetworkConfig *config) {
-    Screen::instance()->setConfig(config);
-    return Screen::instance();
-}
+constexpr std::chrono::seconds errorTime{3};
 
 } // namespace
-
-IfaceStaticMenu *IfaceStaticMenu::theInstance = nullptr;
-
-IfaceStaticMenu *IfaceStaticMenu::instance() {
-    if (theInstance == nullptr)
-        theInstance = new IfaceStaticMenu;
-    return theInstance;
-}
-
-IfaceStaticMenu::IfaceStaticMenu()
-    : items{"Set IP Addr", "Set Netmask",  "Set Gateway",
-            "Add DNS Svr", "Lst DNS Svrs", "Apply Changes"} {}
 
 bool IfaceStaticMenu::applyStatic() {
     const std::string error = config->apply();
     if (error.empty())
         return true;
-    panel->showText("Error:\n" + error);
-    usleep(errorPauseUs);
+    showFor(panel, errorTime, "Error:\n" + error);
     return false;
 }
 
 std::string IfaceStaticMenu::renderItems() const {
-    const auto row = [this](std::int32_t item, bool marked, const char *indicator) {
-        std::string label = items.at(static_cast<std::size_t>(item));
+    const auto row = [this](int number, bool goesOn, const char *indicator) {
+        std::string label = items[window.entryOn(number)].label;
         label.resize(labelColumns, ' ');
-        return (marked ? "> " : "  ") + label + indicator;
+        return std::string(1, window.marker(number)) + " " + label + (goesOn ? indicator : "");
     };
-    const char *upIndicator = topItem > 0 ? "^" : "";
-    const char *downIndicator = topItem < lastTopItem ? "v" : "";
-    return row(topItem, !cursorRow, upIndicator) + "\n" +
-           row(topItem + 1, cursorRow, downIndicator);
-}
-
-void IfaceStaticMenu::redrawItems() {
-    panel->showText(renderItems());
-}
-
-void IfaceStaticMenu::moveMarkerTo(bool bottomRow) {
-    drawMarkers(panel, bottomRow ? 1 : 0);
-    cursorRow = bottomRow;
-}
-
-std::int32_t IfaceStaticMenu::selectedItem() const {
-    return topItem + (cursorRow ? 1 : 0);
-}
-
-void IfaceStaticMenu::selectFirstItem() {
-    topItem = 0;
-    cursorRow = false;
+    return row(0, window.hasEntriesAbove(), "^") + "\n" +
+           row(1, window.hasEntriesBelow(std::size(items)), "v");
 }
 
 void IfaceStaticMenu::display(MenuContext *) {
-    if (drawn)
-        return;
-    drawn = true;
-    redrawItems();
+    if (drawn.isDue())
+        panel->showText(renderItems());
 }
 
 void IfaceStaticMenu::onUp(MenuContext *) {
-    if (panel->isHeldShort(keyUp))
-        return;
-    if (cursorRow) {
-        moveMarkerTo(false);
-    } else if (topItem > 0) {
-        --topItem;
-        redrawItems();
-    }
+    if (actsRestsAndRepeats(panel, keyUp) && window.up())
+        panel->showText(renderItems());
 }
 
 void IfaceStaticMenu::onDown(MenuContext *) {
-    if (panel->isHeldShort(keyDown))
-        return;
-    if (!cursorRow) {
-        moveMarkerTo(true);
-    } else if (topItem < lastTopItem) {
-        ++topItem;
-        redrawItems();
-    }
+    if (actsRestsAndRepeats(panel, keyDown) && window.down(std::size(items)))
+        panel->showText(renderItems());
 }
 
 void IfaceStaticMenu::onEscape(MenuContext *context) {
-    if (isHeld(panel, keyEscape))
+    if (!actsOncePerPress(panel, keyEscape))
         return;
-    selectFirstItem();
-    leaveScreen(this, drawn, context, IfaceTypeMenu::instance());
+    window.selectFirst();
+    drawn.leaveFor(context, IfaceTypeMenu::instance());
 }
 
 void IfaceStaticMenu::onEnter(MenuContext *context) {
-    if (isHeld(panel, keyEnter))
-        return;
-    if (selectedItem() == applyItem) {
-        applyChanges(context);
-    } else {
-        openItem(context);
-    }
+    if (actsOncePerPress(panel, keyEnter))
+        (this->*items[window.selected()].enter)(context);
 }
 
-void IfaceStaticMenu::openItem(MenuContext *context) {
-    Menu *next = nullptr;
-    switch (selectedItem()) {
-    case setAddress:
-        next = screenFor<IfaceStaticEditIPMenu>(config);
-        break;
-    case setNetmask:
-        next = screenFor<IfaceStaticEditNMMenu>(config);
-        break;
-    case setGateway:
-        next = screenFor<IfaceStaticEditGWMenu>(config);
-        break;
-    case addDns:
-        next = screenFor<IfaceStaticEditDNSMenu>(config);
-        break;
-    default:
-        next = screenFor<IfaceStaticListDNSMenu>(config);
-        break;
-    }
-    leaveScreen(this, drawn, context, next);
+template <typename Screen> void IfaceStaticMenu::openScreen(MenuContext *context) {
+    Screen::instance()->setConfig(config);
+    drawn.leaveFor(context, Screen::instance());
 }
 
 void IfaceStaticMenu::applyChanges(MenuContext *context) {
     panel->showText("Applying\nStatic Settings");
     if (!applyStatic()) {
-        drawn = false; // the items come back where the error stood
+        drawn.drawAgain(); // the items come back where the error stood
         return;
     }
     config = nullptr;
-    selectFirstItem();
-    leaveScreen(this, drawn, context, MainMenu::instance());
+    window.selectFirst();
+    drawn.leaveFor(context, MainMenu::instance());
 }

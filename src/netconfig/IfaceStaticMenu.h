@@ -1,25 +1,31 @@
 #pragma once
 
+#include "parts/DrawnOnce.h"
+#include "parts/ListWindow.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
-#include <array>
-#include <cstdint>
 #include <string>
 
 class NetworkConfig;
 
-/// The list of what can be done with a port's static settings, two items at a time. The marker
-/// moves within the window first; the window scrolls when the marker is at its edge.
+/// The list of what can be done with a port's static settings, two items at a time.
 class IfaceStaticMenu : public Menu {
   public:
-    static IfaceStaticMenu *instance();
+    static IfaceStaticMenu *instance() {
+        return onlyOne([] { return new IfaceStaticMenu; });
+    }
 
     /// Not owned. To be called before the screen is made current.
     void setConfig(NetworkConfig *settings) { config = settings; }
 
+    /// The two items in the window, with the marker in front of them and, at the end of a row, a
+    /// "^" or "v" where the list goes on.
+    [[nodiscard]] std::string renderItems() const;
+
     /// Applies the settings and waits for the outcome. False when they were refused; the reason has
     /// then been on the panel for 3 s, during which no key is read.
-    bool applyStatic();
+    [[nodiscard]] bool applyStatic();
 
     void display(MenuContext *context) override;
     void onUp(MenuContext *context) override;
@@ -28,21 +34,15 @@ class IfaceStaticMenu : public Menu {
     void onEnter(MenuContext *context) override;
 
   private:
-    IfaceStaticMenu();
+    struct Item;
+    static const Item items[];
 
-    std::string renderItems() const;
-    void redrawItems();
-    void moveMarkerTo(bool bottomRow);
-    std::int32_t selectedItem() const;
-    void selectFirstItem();
-    void openItem(MenuContext *context);
+    IfaceStaticMenu() = default;
+
+    template <typename Screen> void openScreen(MenuContext *context);
     void applyChanges(MenuContext *context);
 
-    bool drawn = false;
+    DrawnOnce drawn{this};
     NetworkConfig *config = nullptr;
-    std::array<std::string, 6> items;
-    std::int32_t topItem = 0; ///< item on the top row, 0 to 4
-    bool cursorRow = false;   ///< true: the marker is on the bottom row
-
-    static IfaceStaticMenu *theInstance;
+    ListWindow window{panel};
 };

@@ -2,18 +2,10 @@
 
 #include "netconfig/IfaceDHCPApplyMenu.h"
 #include "netconfig/IfaceStaticMenu.h"
+#include "parts/drawMarkers.h"
+#include "parts/keyFilters.h"
 #include "runtime/LcdPanel.h"
-#include "runtime/drawMarkers.h"
-#include "runtime/leaveScreen.h"
 #include "status/MainMenu.h"
-
-IfaceTypeMenu *IfaceTypeMenu::theInstance = nullptr;
-
-IfaceTypeMenu *IfaceTypeMenu::instance() {
-    if (theInstance == nullptr)
-        theInstance = new IfaceTypeMenu;
-    return theInstance;
-}
 
 void IfaceTypeMenu::selectInterface(const std::string &name) {
     config = std::make_unique<NetworkConfig>(name);
@@ -21,13 +13,13 @@ void IfaceTypeMenu::selectInterface(const std::string &name) {
 }
 
 void IfaceTypeMenu::display(MenuContext *) {
-    if (drawn)
+    if (!drawn.isDue())
         return;
-    drawn = true;
     const bool dhcpChosen = config != nullptr && config->isDhcp();
     panel->showText(dhcpChosen ? "> DHCP\n  Static" : "  DHCP\n> Static");
 }
 
+// Up and Down have no hold filter: the marker stops at once, so a held key has nothing to repeat.
 void IfaceTypeMenu::onUp(MenuContext *) {
     if (config == nullptr || config->isDhcp())
         return;
@@ -43,19 +35,18 @@ void IfaceTypeMenu::onDown(MenuContext *) {
 }
 
 void IfaceTypeMenu::onEscape(MenuContext *context) {
-    if (isHeld(panel, keyEscape))
-        return;
-    leaveScreen(this, drawn, context, MainMenu::instance());
+    if (actsOncePerPress(panel, keyEscape))
+        drawn.leaveFor(context, MainMenu::instance());
 }
 
 void IfaceTypeMenu::onEnter(MenuContext *context) {
-    if (isHeld(panel, keyEnter) || config == nullptr)
+    if (!actsOncePerPress(panel, keyEnter) || config == nullptr)
         return;
     if (config->isDhcp()) {
         IfaceDHCPApplyMenu::instance()->setConfig(config.get());
-        leaveScreen(this, drawn, context, IfaceDHCPApplyMenu::instance());
+        drawn.leaveFor(context, IfaceDHCPApplyMenu::instance());
     } else {
         IfaceStaticMenu::instance()->setConfig(config.get());
-        leaveScreen(this, drawn, context, IfaceStaticMenu::instance());
+        drawn.leaveFor(context, IfaceStaticMenu::instance());
     }
 }

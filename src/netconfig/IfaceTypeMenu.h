@@ -1,7 +1,9 @@
 #pragma once
 
 #include "netconfig/NetworkConfig.h"
+#include "parts/DrawnOnce.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 #include <memory>
 #include <string>
@@ -10,7 +12,9 @@
 /// moving it changes the setting at once, and Escape does not undo it.
 class IfaceTypeMenu : public Menu {
   public:
-    static IfaceTypeMenu *instance();
+    static IfaceTypeMenu *instance() {
+        return onlyOne([] { return new IfaceTypeMenu; });
+    }
 
     /// Replaces the settings in work by those that the system's files hold for this port. To be
     /// called before the screen is made current.
@@ -25,8 +29,6 @@ class IfaceTypeMenu : public Menu {
   private:
     IfaceTypeMenu() = default;
 
-    bool drawn = false;
+    DrawnOnce drawn{this};
     std::unique_ptr<NetworkConfig> config; ///< the one that all configuration screens work on
-
-    static IfaceTypeMenu *theInstance;
 };

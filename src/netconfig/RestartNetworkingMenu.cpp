@@ -1,17 +1,14 @@
 #include "netconfig/RestartNetworkingMenu.h"
 
-#include "runtime/LcdPanel.h"
-#include "runtime/leaveScreen.h"
+#include "parts/showFor.h"
 #include "runtime/runCommand.h"
 #include "status/MainMenu.h"
 
 #include <ace/OS_NS_sys_time.h>
 
-#include <unistd.h>
-
 namespace {
 
-constexpr useconds_t firstPauseUs = 1000000;
+constexpr std::chrono::seconds firstPause{1};
 
 constexpr const char *restartProcesses =
     "ps aux | egrep '/etc/init.d/networking|/opt/scripts/configureHostname.sh' | grep -v grep";
@@ -19,20 +16,10 @@ constexpr const char *restartProcesses =
 } // namespace
 
 const ACE_Time_Value RestartNetworkingMenu::pollInterval(1);
-RestartNetworkingMenu *RestartNetworkingMenu::theInstance = nullptr;
-
-RestartNetworkingMenu *RestartNetworkingMenu::instance() {
-    if (theInstance == nullptr)
-        theInstance = new RestartNetworkingMenu;
-    return theInstance;
-}
 
 void RestartNetworkingMenu::display(MenuContext *context) {
-    if (!drawn) {
-        drawn = true;
-        panel->showText("Restarting\nNetworking");
-        usleep(firstPauseUs);
-    }
+    if (drawn.isDue())
+        showFor(panel, firstPause, "Restarting\nNetworking");
     const ACE_Time_Value now = ACE_OS::gettimeofday();
     if (!(now - lastPoll > pollInterval))
         return;
@@ -41,6 +28,7 @@ void RestartNetworkingMenu::display(MenuContext *context) {
         leave(context);
 }
 
+// No key has a hold filter: whatever is pressed gives up the wait, also when it was down before.
 void RestartNetworkingMenu::onUp(MenuContext *context) {
     leave(context);
 }
@@ -58,5 +46,5 @@ void RestartNetworkingMenu::onEnter(MenuContext *context) {
 }
 
 void RestartNetworkingMenu::leave(MenuContext *context) {
-    leaveScreen(this, drawn, context, MainMenu::instance());
+    drawn.leaveFor(context, MainMenu::instance());
 }

@@ -1,13 +1,21 @@
 #pragma once
 
+#include "parts/DrawnOnce.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 #include <ace/Time_Value.h>
 
 /// Waits until the system has finished restarting its network, or until any key is pressed.
+///
+/// No screen opens it: the configuration script returns only when the network is up again, so both
+/// applies go straight back to the status pages. It is kept, whole and tested, for a script that
+/// restarts the network in the background.
 class RestartNetworkingMenu : public Menu {
   public:
-    static RestartNetworkingMenu *instance();
+    static RestartNetworkingMenu *instance() {
+        return onlyOne([] { return new RestartNetworkingMenu; });
+    }
 
     /// Blocks for 1 s when the screen is first drawn, then looks for the restart's processes at
     /// most once a second.
@@ -24,8 +32,6 @@ class RestartNetworkingMenu : public Menu {
 
     static const ACE_Time_Value pollInterval;
 
-    bool drawn = false;
+    DrawnOnce drawn{this};
     ACE_Time_Value lastPoll; ///< zero: the first check is due at once
-
-    static RestartNetworkingMenu *theInstance;
 };

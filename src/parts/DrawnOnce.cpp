@@ -1,0 +1,14 @@
+#include "parts/DrawnOnce.h"
+
+#include "runtime/Menu.h"
+
+#include <utility>
+
+bool DrawnOnce::isDue() {
+    return !std::exchange(drawn, true);
+}
+
+void DrawnOnce::leaveFor(MenuContext *context, Menu *next) {
+    drawn = false;
+    screen->setMenu(context, next);
+}

@@ -1,0 +1,10 @@
+#include "parts/drawMarkers.h"
+
+#include "runtime/LcdPanel.h"
+
+void drawMarkers(LcdPanel *panel, int row) {
+    for (int each = 0; each < LcdPanel::rows; ++each) {
+        panel->setCursor(each, 0);
+        panel->writeAtCursor(each == row ? ">" : " ", 1);
+    }
+}

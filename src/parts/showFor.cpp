@@ -1,0 +1,9 @@
+#include "parts/showFor.h"
+
+#include "runtime/LcdPanel.h"
+#include "runtime/pauseFor.h"
+
+void showFor(LcdPanel *panel, std::chrono::seconds time, const std::string &text) {
+    panel->showText(text);
+    pauseFor(time);
+}
