@@ -1,8 +1,8 @@
 #include "editors/AddressEditor.h"
 
 #include "editors/OctetKeys.h"
+#include "parts/keyFilters.h"
 #include "runtime/LcdPanel.h"
-#include "runtime/leaveScreen.h"
 
 namespace {
 
@@ -12,68 +12,70 @@ constexpr std::int32_t lastOctet = 3;
 
 } // namespace
 
-AddressEditor::AddressEditor() : panel(LcdPanel::instance()) {}
+AddressEditor::AddressEditor(Menu *screen, const EditedAddress &row)
+    : panel(LcdPanel::instance()), drawn(screen), ownAddress(row), address(&row) {}
 
-void AddressEditor::display(const EditedAddress &edited, ServerIndex server) {
-    if (drawn)
+void AddressEditor::editForOneVisit(const EditedAddress &row, ServerIndex index) {
+    address = &row;
+    serverIndex = index;
+}
+
+void AddressEditor::display() {
+    if (!drawn.isDue() || config == nullptr)
         return;
-    drawn = true;
-    if (config == nullptr)
-        return;
-    std::string text = edited.shown(*config, server);
+    std::string text = address->shown(*config, serverIndex);
     parseDottedQuad(text, octets);
-    panel->showText(edited.prompt + formatDottedQuad(octets, true));
+    panel->showText(address->prompt + formatDottedQuad(octets, true));
     panel->setCursor(addressRow, firstOctetLastDigit);
     panel->cursorBlinkOn();
     octetIndex = 0;
 }
 
-void AddressEditor::stepUp() {
-    if (panel->isHeldShort(keyUp))
-        return;
-    octet() = incrementOctet(octet());
-    redrawOctet(formatOctet(octet(), true));
+void AddressEditor::onUp() {
+    if (actsRestsAndRepeats(panel, keyUp))
+        changeOctet(incrementOctet(octet()));
 }
 
-void AddressEditor::stepDown() {
-    if (panel->isHeldShort(keyDown))
-        return;
-    octet() = decrementOctet(octet());
-    redrawOctet(formatOctet(octet(), true));
+void AddressEditor::onDown() {
+    if (actsRestsAndRepeats(panel, keyDown))
+        changeOctet(decrementOctet(octet()));
 }
 
-bool AddressEditor::stepBack(const EditedAddress &edited, Menu *screen, MenuContext *context) {
-    if (isHeld(panel, keyEscape))
-        return false;
+void AddressEditor::onEscape(MenuContext *context) {
+    if (!actsOncePerPress(panel, keyEscape))
+        return;
     if (octetIndex > 0) {
         --octetIndex;
         cursorToPrevOctet();
-        return false;
+    } else {
+        leaveFor(context, address->afterEscape());
     }
-    leave(screen, context, edited.afterEscape());
-    return true;
 }
 
-bool AddressEditor::stepOn(const EditedAddress &edited, Menu *screen, MenuContext *context,
-                           ServerIndex server) {
-    if (isHeld(panel, keyEnter))
-        return false;
+void AddressEditor::onEnter(MenuContext *context) {
+    if (!actsOncePerPress(panel, keyEnter))
+        return;
     if (octetIndex < lastOctet) {
         ++octetIndex;
         cursorToNextOctet();
-        return false;
+        return;
     }
     if (config != nullptr)
-        edited.store(*config, server, formatDottedQuad(octets, false));
-    leave(screen, context, edited.afterStore());
-    return true;
+        address->store(*config, serverIndex, formatDottedQuad(octets, false));
+    leaveFor(context, address->afterStore());
 }
 
 std::int32_t &AddressEditor::octet() {
     return octets[static_cast<std::size_t>(octetIndex)];
 }
 
-void AddressEditor::leave(Menu *screen, MenuContext *context, Menu *next) {
+void AddressEditor::changeOctet(std::int32_t value) {
+    octet() = value;
+    redrawOctet(formatOctet(value, true));
+}
+
+void AddressEditor::leaveFor(MenuContext *context, Menu *next) {
+    editForOneVisit(ownAddress, noServer);
     panel->cursorOff();
-    leaveScreen(screen, drawn, context, next);
+    drawn.leaveFor(context, next);
 }

@@ -2,6 +2,7 @@
 
 #include "editors/DottedQuad.h"
 #include "editors/EditedAddress.h"
+#include "parts/DrawnOnce.h"
 
 #include <cstdint>
 
@@ -16,26 +17,31 @@ class NetworkConfig;
 /// address it is, and where the screen leads, stands in its row of the table of addresses.
 class AddressEditor {
   public:
-    AddressEditor();
+    /// The editor on `screen`, of the address that is described by `row`.
+    AddressEditor(Menu *screen, const EditedAddress &row);
 
     /// Not owned. Without it nothing is drawn and nothing stored.
     void setConfig(NetworkConfig *settings) { config = settings; }
+    /// Edits another address, one in the list of servers, until the screen is left.
+    void editForOneVisit(const EditedAddress &row, ServerIndex index);
 
-    void display(const EditedAddress &edited, ServerIndex server = noServer);
-    void stepUp();
-    void stepDown();
-    /// Both return true when they have left `screen`, the one that this is the editor of.
-    bool stepBack(const EditedAddress &edited, Menu *screen, MenuContext *context);
-    bool stepOn(const EditedAddress &edited, Menu *screen, MenuContext *context,
-                ServerIndex server = noServer);
+    void display();
+    void onUp();
+    void onDown();
+    void onEscape(MenuContext *context);
+    void onEnter(MenuContext *context);
 
   private:
     std::int32_t &octet();
-    void leave(Menu *screen, MenuContext *context, Menu *next);
+    void changeOctet(std::int32_t value);
+    void leaveFor(MenuContext *context, Menu *next);
 
     LcdPanel *panel;
-    bool drawn = false;
+    DrawnOnce drawn;
     NetworkConfig *config = nullptr;
     Octets octets{};
     std::int32_t octetIndex = 0; ///< 0 to 3
+    const EditedAddress &ownAddress;
+    const EditedAddress *address; ///< the one that is edited on this visit
+    ServerIndex serverIndex = noServer;
 };

@@ -14,7 +14,7 @@ using Octets = std::array<std::int32_t, 4>;
 void parseDottedQuad(std::string &text, Octets &octets);
 
 /// Each octet limited to 0..255; with `padded`, three columns wide as the panel shows it.
-std::string formatDottedQuad(const Octets &octets, bool padded);
+[[nodiscard]] std::string formatDottedQuad(const Octets &octets, bool padded);
 
 /// One octet in the same form.
-std::string formatOctet(std::int32_t value, bool padded);
+[[nodiscard]] std::string formatOctet(std::int32_t value, bool padded);

@@ -7,26 +7,11 @@
 
 namespace {
 
-template <std::string (NetworkConfig::*get)() const>
-std::string setting(const NetworkConfig &config, ServerIndex) {
-    return (config.*get)();
-}
+using Config = NetworkConfig;
+using Text = const std::string &;
 
-template <void (NetworkConfig::*set)(const std::string &)>
-void storeSetting(NetworkConfig &config, ServerIndex, const std::string &text) {
-    (config.*set)(text);
-}
-
-std::string nothing(const NetworkConfig &, ServerIndex) {
-    return "";
-}
-
-std::string server(const NetworkConfig &config, ServerIndex index) {
-    return config.getDns(static_cast<std::uint32_t>(index));
-}
-
-void replaceServer(NetworkConfig &config, ServerIndex index, const std::string &text) {
-    config.setDns(static_cast<std::uint32_t>(index), text);
+std::uint32_t position(ServerIndex server) {
+    return static_cast<std::uint32_t>(server);
 }
 
 template <typename Screen> Menu *to() {
@@ -35,25 +20,42 @@ template <typename Screen> Menu *to() {
 
 } // namespace
 
-// clang-format off
 const EditedAddress portAddress{
     "Enter IP Addr:\n",
-    setting<&NetworkConfig::getAddress>, storeSetting<&NetworkConfig::setAddress>,
-    to<IfaceStaticMenu>, to<IfaceStaticMenu>};
+    [](const Config &config, ServerIndex) { return config.getAddress(); },
+    [](Config &config, ServerIndex, Text text) { config.setAddress(text); },
+    to<IfaceStaticMenu>,
+    to<IfaceStaticMenu>,
+};
+
 const EditedAddress portNetmask{
     "Enter Netmask:\n",
-    setting<&NetworkConfig::getNetmask>, storeSetting<&NetworkConfig::setNetmask>,
-    to<IfaceStaticMenu>, to<IfaceStaticMenu>};
+    [](const Config &config, ServerIndex) { return config.getNetmask(); },
+    [](Config &config, ServerIndex, Text text) { config.setNetmask(text); },
+    to<IfaceStaticMenu>,
+    to<IfaceStaticMenu>,
+};
+
 const EditedAddress portGateway{
     "Enter Gateway:\n",
-    setting<&NetworkConfig::getGateway>, storeSetting<&NetworkConfig::setGateway>,
-    to<IfaceStaticMenu>, to<IfaceStaticMenu>};
+    [](const Config &config, ServerIndex) { return config.getGateway(); },
+    [](Config &config, ServerIndex, Text text) { config.setGateway(text); },
+    to<IfaceStaticMenu>,
+    to<IfaceStaticMenu>,
+};
+
 const EditedAddress newServer{
     "DNS Server Addr:\n",
-    nothing, storeSetting<&NetworkConfig::addDns>,
-    to<IfaceStaticMenu>, to<IfaceStaticMenu>};
+    [](const Config &, ServerIndex) { return std::string(); },
+    [](Config &config, ServerIndex, Text text) { config.addDns(text); },
+    to<IfaceStaticMenu>,
+    to<IfaceStaticMenu>,
+};
+
 const EditedAddress listedServer{
     "DNS Server Addr:\n",
-    server, replaceServer,
-    to<IfaceStaticDNSActionMenu>, to<IfaceStaticListDNSMenu>};
-// clang-format on
+    [](const Config &config, ServerIndex server) { return config.getDns(position(server)); },
+    [](Config &config, ServerIndex server, Text text) { config.setDns(position(server), text); },
+    to<IfaceStaticDNSActionMenu>,
+    to<IfaceStaticListDNSMenu>,
+};

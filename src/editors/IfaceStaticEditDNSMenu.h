@@ -2,31 +2,28 @@
 
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 /// Adds a DNS server to the port in work, or changes one of those that it has.
 class IfaceStaticEditDNSMenu : public Menu {
   public:
-    static IfaceStaticEditDNSMenu *instance();
+    static IfaceStaticEditDNSMenu *instance() {
+        return onlyOne([] { return new IfaceStaticEditDNSMenu; });
+    }
 
     /// Not owned. To be called before the screen is made current.
     void setConfig(NetworkConfig *settings) { editor.setConfig(settings); }
-
     /// Position of the server to be changed, negative to add one. Holds for one visit.
-    void setServerIndex(ServerIndex index) { serverIndex = index; }
+    void setServerIndex(ServerIndex index);
 
-    void display(MenuContext *context) override;
-    void onUp(MenuContext *context) override;
-    void onDown(MenuContext *context) override;
-    void onEscape(MenuContext *context) override;
-    void onEnter(MenuContext *context) override;
+    void display(MenuContext *) override { editor.display(); }
+    void onUp(MenuContext *) override { editor.onUp(); }
+    void onDown(MenuContext *) override { editor.onDown(); }
+    void onEscape(MenuContext *context) override { editor.onEscape(context); }
+    void onEnter(MenuContext *context) override { editor.onEnter(context); }
 
   private:
-    IfaceStaticEditDNSMenu() = default;
-
-    const EditedAddress &edited() const;
+    IfaceStaticEditDNSMenu();
 
     AddressEditor editor;
-    ServerIndex serverIndex = noServer;
-
-    static IfaceStaticEditDNSMenu *theInstance;
 };

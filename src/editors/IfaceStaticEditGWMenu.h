@@ -2,25 +2,26 @@
 
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 /// Edits the default gateway of the port in work.
 class IfaceStaticEditGWMenu : public Menu {
   public:
-    static IfaceStaticEditGWMenu *instance();
+    static IfaceStaticEditGWMenu *instance() {
+        return onlyOne([] { return new IfaceStaticEditGWMenu; });
+    }
 
     /// Not owned. To be called before the screen is made current.
     void setConfig(NetworkConfig *settings) { editor.setConfig(settings); }
 
-    void display(MenuContext *context) override;
-    void onUp(MenuContext *context) override;
-    void onDown(MenuContext *context) override;
-    void onEscape(MenuContext *context) override;
-    void onEnter(MenuContext *context) override;
+    void display(MenuContext *) override { editor.display(); }
+    void onUp(MenuContext *) override { editor.onUp(); }
+    void onDown(MenuContext *) override { editor.onDown(); }
+    void onEscape(MenuContext *context) override { editor.onEscape(context); }
+    void onEnter(MenuContext *context) override { editor.onEnter(context); }
 
   private:
-    IfaceStaticEditGWMenu() = default;
+    IfaceStaticEditGWMenu();
 
     AddressEditor editor;
-
-    static IfaceStaticEditGWMenu *theInstance;
 };

@@ -2,25 +2,26 @@
 
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 
 /// Edits the address of the port in work.
 class IfaceStaticEditIPMenu : public Menu {
   public:
-    static IfaceStaticEditIPMenu *instance();
+    static IfaceStaticEditIPMenu *instance() {
+        return onlyOne([] { return new IfaceStaticEditIPMenu; });
+    }
 
     /// Not owned. To be called before the screen is made current.
     void setConfig(NetworkConfig *settings) { editor.setConfig(settings); }
 
-    void display(MenuContext *context) override;
-    void onUp(MenuContext *context) override;
-    void onDown(MenuContext *context) override;
-    void onEscape(MenuContext *context) override;
-    void onEnter(MenuContext *context) override;
+    void display(MenuContext *) override { editor.display(); }
+    void onUp(MenuContext *) override { editor.onUp(); }
+    void onDown(MenuContext *) override { editor.onDown(); }
+    void onEscape(MenuContext *context) override { editor.onEscape(context); }
+    void onEnter(MenuContext *context) override { editor.onEnter(context); }
 
   private:
-    IfaceStaticEditIPMenu() = default;
+    IfaceStaticEditIPMenu();
 
     AddressEditor editor;
-
-    static IfaceStaticEditIPMenu *theInstance;
 };

@@ -5,10 +5,10 @@
 #include <string>
 
 /// The value one step up, or three while Up is held long; 255 is followed by 0.
-std::int32_t incrementOctet(std::int32_t value);
+[[nodiscard]] std::int32_t incrementOctet(std::int32_t value);
 
 /// The value one step down, or three while Down is held long; 0 is followed by 255.
-std::int32_t decrementOctet(std::int32_t value);
+[[nodiscard]] std::int32_t decrementOctet(std::int32_t value);
 
 /// Rewrites the three characters of the octet whose last digit the cursor is on, and leaves the
 /// cursor there.

@@ -131,7 +131,3 @@ KeyCode LcdPanel::pollKey() {
     countKey(key);
     return key;
 }
-
-bool isHeld(const LcdPanel *panel, KeyCode key) {
-    return panel->isHeldShort(key) || panel->isHeldLong(key);
-}

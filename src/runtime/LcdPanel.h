@@ -71,7 +71,3 @@ class LcdPanel {
     HeldKeys heldKeys;
     Marquee marquee;
 };
-
-/// True from the second consecutive poll that reported `key` on: a handler that does nothing then
-/// acts once per press.
-bool isHeld(const LcdPanel *panel, KeyCode key);
