@@ -1,6 +1,6 @@
 #include "Operator.h"
 
-#include "status/Interfaces.h"
+#include "status/NetworkPorts.h"
 #include "status/PageTexts.h"
 
 #include <csignal>
@@ -180,7 +180,7 @@ TEST(Status, PortsAreListedWhenTheyHaveAnAddressAndASignalListsThemAgain) {
     world().shellWorks = false; // every look-up now gives the same word, which counts as an address
     raise(SIGUSR1);
     person.poll();
-    EXPECT_EQ(listPagedInterfaces(), std::vector<std::string>{"ERROR"});
+    EXPECT_EQ(listPortsWithPage(), std::vector<std::string>{"ERROR"});
     EXPECT_EQ(interfaceText("eth0"), "E0 (eth0)\nERROR");
     EXPECT_EQ(hostnameText(), "Hostname:\nERROR");
 }

@@ -1,12 +1,11 @@
 #pragma once
 
 #include "runtime/Menu.h"
+#include "runtime/onlyOne.h"
 #include "status/PlatformCode.h"
-
-#include <ace/Time_Value.h>
+#include "status/RotationTimer.h"
 
 #include <csignal>
-#include <cstdint>
 #include <list>
 #include <string>
 
@@ -15,11 +14,14 @@
 /// name's and the ports' pages into their settings.
 class MainMenu : public Menu {
   public:
-    static MainMenu *instance();
+    static MainMenu *instance() {
+        return onlyOne([] { return new MainMenu; });
+    }
 
     /// Asks the next `display` to look for ports anew and to start again at the first page. Safe in
     /// a signal handler at any time, also before the main menu exists.
     static void requestRefresh();
+    void refresh();
 
     void display(MenuContext *context) override;
     void onUp(MenuContext *context) override;
@@ -27,32 +29,26 @@ class MainMenu : public Menu {
     void onEscape(MenuContext *context) override;
     void onEnter(MenuContext *context) override;
 
+    /// Lists the pages anew. The current page becomes the last: the first is shown next.
+    void rebuildPages();
+    /// Adds the pages of the network ports that have one.
+    void appendInterfacePages();
+    /// The two lines of the page of this name, computed afresh.
+    [[nodiscard]] std::string pageText(const std::string &name) const;
+    /// Move on by one page, round and round, and return its text.
+    std::string nextPage();
+    std::string previousPage();
+    /// Leaves the status display for `menu` so that the page that is left is drawn on return.
+    void enterSubmenu(MenuContext *context, Menu *menu);
+
   private:
     MainMenu();
 
-    void refresh();
-    void rebuildPages();
-    void appendInterfacePages();
-    std::string pageText(const std::string &name) const;
-    std::string nextPage();
-    std::string previousPage();
     void showPageAskedFor(const std::string &text);
-    void enterSubmenu(MenuContext *context, Menu *menu);
 
-    static const ACE_Time_Value autoPageInterval;
-    static const ACE_Time_Value manualPageInterval;
-    static const ACE_Time_Value firstScrollDelay;
-    static const ACE_Time_Value scrollStepInterval;
-
-    ACE_Time_Value pageInterval = autoPageInterval;
-    ACE_Time_Value lastPageChange; ///< zero makes the next `display` advance
-    ACE_Time_Value lastScroll;
-    std::list<std::string> pages;
+    RotationTimer rotation;
+    std::list<std::string> pages;                       ///< their names
     std::list<std::string>::const_iterator currentPage; ///< always an element
-    std::uint32_t scrollSteps = 0; ///< steps still to be made that keep the page on screen
-    ACE_Time_Value scrollInterval = firstScrollDelay;
     static volatile std::sig_atomic_t refreshRequested;
     PlatformCode platform;
-
-    static MainMenu *theInstance;
 };

@@ -2,7 +2,7 @@
 
 #include "runtime/beginsWith.h"
 #include "runtime/runCommand.h"
-#include "status/Interfaces.h"
+#include "status/NetworkPorts.h"
 
 #include <fstream>
 #include <optional>

@@ -6,13 +6,13 @@
 #include <string>
 
 /// The banner of the model; empty for an unknown one.
-std::string productText(PlatformCode platform);
+[[nodiscard]] std::string productText(PlatformCode platform);
 
-std::string hostnameText();
+[[nodiscard]] std::string hostnameText();
 
 /// Which management server the appliance is connected to. Any file that is missing or does not say
 /// so reads as no server.
-std::string connectionText();
+[[nodiscard]] std::string connectionText();
 
 /// A port's label and name, and its address or the reason why there is none.
-std::string interfaceText(const std::string &name);
+[[nodiscard]] std::string interfaceText(const std::string &name);

@@ -13,9 +13,9 @@ constexpr PlatformCode platformUnknown = 4;
 
 /// The model named at the start of the first line of `/etc/ma-platform`; unknown when the file
 /// cannot be read or names none.
-PlatformCode detectPlatform();
+[[nodiscard]] PlatformCode detectPlatform();
 
 /// Only hardware models have a banner with the device's name and connect to a management server.
-constexpr bool isHardware(PlatformCode platform) {
+[[nodiscard]] constexpr bool isHardware(PlatformCode platform) {
     return platform < platformCloud;
 }

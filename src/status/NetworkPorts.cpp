@@ -1,4 +1,4 @@
-#include "status/Interfaces.h"
+#include "status/NetworkPorts.h"
 
 #include "runtime/beginsWith.h"
 #include "runtime/runCommand.h"
@@ -12,6 +12,9 @@ namespace {
 // Names joined by commas. The filter works on whole lines of the listing, and a single "v" anywhere
 // drops the line: virtual interfaces of every kind stay off the panel. The shell's `echo` has to
 // turn backslash-n into a line feed.
+//
+// Whoever traces the program's commands on an appliance knows this one by its text, the runs of
+// blanks included. Its length is asserted because a lost blank would change nothing else.
 constexpr std::string_view listCommand =
     "echo \"`ifconfig -s |       sed 1d |       egrep -v 'lo|ani|docker|v|ipsec_|ssl_' |"
     "       awk '{ print $1 } '`\\neth4\\neth5\" |       sort -u | tr '\n' ','";
@@ -41,7 +44,7 @@ bool alwaysHasPage(const std::string &name) {
 
 } // namespace
 
-std::vector<std::string> listPagedInterfaces() {
+std::vector<std::string> listPortsWithPage() {
     const QLX::String<char> listing = runCommand(listCommand.data(), true);
     std::vector<std::string> paged;
     for (const auto &name : splitString(listing, QLX::String<char>(nameSeparator))) {
