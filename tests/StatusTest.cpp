@@ -188,7 +188,7 @@ TEST(Status, PortsAreListedWhenTheyHaveAnAddressAndASignalListsThemAgain) {
 TEST(Status, APortPageShowsItsLabelAndItsAddressOrWhyThereIsNone) {
     const std::vector<std::pair<std::string, std::string>> labels = {
         {"bridge0", "E0/E1"}, {"bridge1", "E2/E3"}, {"bridge0x", ""}, {"eth10", "E1"},
-        {"eth0.100", "E0"},   {"eth6", "E6"},       {"eth8", ""},     {"eth", ""}};
+        {"eth0.100", "E0"},   {"eth7", "E7"},       {"eth8", ""},     {"eth", ""}};
     for (const auto &[name, label] : labels)
         EXPECT_EQ(portLabel(name), label) << name;
 
