@@ -4,6 +4,6 @@
 #include <string_view>
 
 /// True when the first characters of `text` are exactly `prefix`.
-inline bool beginsWith(const std::string &text, std::string_view prefix) {
+[[nodiscard]] inline bool beginsWith(const std::string &text, std::string_view prefix) {
     return text.compare(0, prefix.length(), prefix) == 0;
 }
