@@ -5,23 +5,9 @@
 #include "runtime/beginsWith.h"
 #include "status/PageTexts.h"
 
-#include <array>
-
 namespace {
 
-std::string product(const std::string &, PlatformCode platform) {
-    return productText(platform);
-}
-std::string hostname(const std::string &, PlatformCode) {
-    return hostnameText();
-}
-std::string connection(const std::string &, PlatformCode) {
-    return connectionText();
-}
-std::string port(const std::string &name, PlatformCode) {
-    return interfaceText(name);
-}
-
+// Enter opens nothing. Bridges, too, cannot be configured from the panel.
 constexpr StatusPage::Settings nothing = nullptr;
 
 Menu *hostnameEditor(const std::string &) {
@@ -33,12 +19,15 @@ Menu *portSettings(const std::string &name) {
 }
 
 using Names = StatusPage::Names;
-constexpr std::array table = {
-    StatusPage{Names::one, "product", product, nothing},
-    StatusPage{Names::one, "hostname", hostname, hostnameEditor},
-    StatusPage{Names::oneOnHardware, "connection", connection, nothing},
-    StatusPage{Names::ports, "bridge", port, nothing}, // is not configured from the panel
-    StatusPage{Names::ports, "eth", port, portSettings},
+using Name = const std::string &;
+constexpr StatusPage table[] = {
+    {Names::one, "product", [](Name, PlatformCode model) { return productText(model); }, nothing},
+    {Names::one, "hostname", [](Name, PlatformCode) { return hostnameText(); }, hostnameEditor},
+    {Names::oneOnHardware, "connection", [](Name, PlatformCode) { return connectionText(); },
+     nothing},
+    {Names::ports, "bridge", [](Name port, PlatformCode) { return interfaceText(port); }, nothing},
+    {Names::ports, "eth", [](Name port, PlatformCode) { return interfaceText(port); },
+     portSettings},
 };
 
 bool isOf(const StatusPage &page, const std::string &name) {
