@@ -37,12 +37,9 @@ TEST(Runtime, AKeyIsHeldShortOnPollsTwoToFiveAndLongFromTheSixth) {
     for (const KeyCode key : {keyUp, keyDown, keyEnter, keyEscape}) {
         for (int poll = 1; poll <= 8; ++poll) {
             panel.countKey(key);
-            EXPECT_EQ(panel.isHeldShort(key), poll >= 2 && poll <= 5) << key << " " << poll;
-            EXPECT_EQ(panel.isHeldLong(key), poll > 5) << key << " " << poll;
-            for (KeyCode other = 0; other <= 5; ++other) {
-                if (other == key)
-                    continue;
-                EXPECT_FALSE(panel.isHeldShort(other) || panel.isHeldLong(other));
+            for (KeyCode each = 0; each <= 5; ++each) {
+                EXPECT_EQ(panel.isHeldShort(each), each == key && poll >= 2 && poll <= 5);
+                EXPECT_EQ(panel.isHeldLong(each), each == key && poll >= 6);
             }
         }
     }
@@ -51,11 +48,7 @@ TEST(Runtime, AKeyIsHeldShortOnPollsTwoToFiveAndLongFromTheSixth) {
 }
 
 TEST(Runtime, AnAnswerIsReadFromItsSecondByteAndAnythingElseEndsTheHold) {
-    struct Case {
-        std::string answer;
-        KeyCode key;
-    };
-    const std::vector<Case> cases = {
+    const std::vector<std::pair<std::string, KeyCode>> cases = {
         {"\x80\xBE", keyUp},
         {std::string("\0\xBD", 2), keyDown},
         {"\xBE\xBB", keyEnter},
@@ -98,11 +91,7 @@ TEST(Runtime, CommandsAreTwoSingleBytesAndTheCursorGoesWhereItIsSent) {
 }
 
 TEST(Runtime, ATextIsTwoRowsOfSixteenAndTheRestIsDroppedOrScrolled) {
-    struct Case {
-        std::string text, rows;
-        int left;
-    };
-    const std::vector<Case> cases = {
+    const std::vector<std::tuple<std::string, std::string, int>> cases = {
         {"", "|", 0},
         {"one", "one|", 0},
         {"Error\nInvalid Hostname", "Error|Invalid Hostname", 0},

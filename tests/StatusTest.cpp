@@ -128,11 +128,7 @@ TEST(Status, TheClockIsReadBeforeAPageIsComputedByItselfAndAfterwardsForAKey) {
 }
 
 TEST(Status, TheModelDecidesTheBannerAndTheConnectionPage) {
-    struct Case {
-        std::string firstLine, banner;
-        bool connects;
-    };
-    const std::vector<Case> cases = {
+    const std::vector<std::tuple<std::string, std::string, bool>> cases = {
         {"q70", product, true},    {"q75-x\nzvm", product, true},
         {"q700-x", product, true}, {"q7", "|", false},
         {"Q75", "|", false},       {"", "|", false},
@@ -205,11 +201,7 @@ TEST(Status, APortPageShowsItsLabelAndItsAddressOrWhyThereIsNone) {
 
 TEST(Status, TheServerIsNamedOnlyWhenBothFilesSaySo) {
     const std::string none = "no server";
-    struct Case {
-        const char *status, *config;
-        std::string server;
-    };
-    const std::vector<Case> cases = {
+    const std::vector<std::tuple<const char *, const char *, std::string>> cases = {
         {"Connection OK\n", "NIS Address: 10.1.2.3\n", "10.1.2.3"},
         {"x\nConnection OK since 10:00", "a\nNIS Address: a b\r\r\nNIS Address: z\n", "a b\r"},
         {"Connection ON\n", "NIS Address: 10.1.2.3\n", none},

@@ -4,8 +4,8 @@
 
 #include <string>
 
-/// Changes the settings of the port called `name` and waits until the script has ended. `options`
-/// begins with a blank. True when the script reported success.
+/// Changes the settings of the port called `name` and waits until the script has ended. True when
+/// the script reported success. The options are built by `NetworkConfig`, each behind a blank.
 [[nodiscard]] bool configurePort(const std::string &name, const std::string &options);
 
 /// Starts the change of the host name, which ends with a reboot of the appliance: there is nothing

@@ -37,8 +37,7 @@ void MainMenu::appendInterfacePages() {
 }
 
 std::string MainMenu::pageText(const std::string &name) const {
-    const StatusPage *page = findStatusPage(name);
-    return page == nullptr ? "undefined" : page->text(name, platform);
+    return statusPageOf(name).text(name, platform);
 }
 
 std::string MainMenu::nextPage() {
@@ -92,9 +91,9 @@ void MainMenu::onEnter(MenuContext *context) {
     if (panel->isHeldLong(keyEnter))
         return;
     const std::string name = *currentPage;
-    const StatusPage *page = findStatusPage(name);
-    if (page != nullptr && page->settings != nullptr)
-        enterSubmenu(context, page->settings(name));
+    const StatusPage &page = statusPageOf(name);
+    if (page.settings != nullptr)
+        enterSubmenu(context, page.settings(name));
 }
 
 // One page back, so that the operator's return advances to the page that was left and shows it

@@ -5,6 +5,9 @@
 #include "runtime/beginsWith.h"
 #include "status/PageTexts.h"
 
+#include <algorithm>
+#include <iterator>
+
 namespace {
 
 // Enter opens nothing. Bridges, too, cannot be configured from the panel.
@@ -25,13 +28,15 @@ constexpr StatusPage table[] = {
     {Names::one, "hostname", [](Name, PlatformCode) { return hostnameText(); }, hostnameEditor},
     {Names::oneOnHardware, "connection", [](Name, PlatformCode) { return connectionText(); },
      nothing},
-    {Names::ports, "bridge", [](Name port, PlatformCode) { return interfaceText(port); }, nothing},
-    {Names::ports, "eth", [](Name port, PlatformCode) { return interfaceText(port); },
+    {Names::beginningSo, "bridge", [](Name port, PlatformCode) { return interfaceText(port); },
+     nothing},
+    {Names::beginningSo, "eth", [](Name port, PlatformCode) { return interfaceText(port); },
      portSettings},
+    {Names::beginningSo, "", [](Name, PlatformCode) { return std::string("undefined"); }, nothing},
 };
 
 bool isOf(const StatusPage &page, const std::string &name) {
-    return page.names == Names::ports ? beginsWith(name, page.name) : name == page.name;
+    return page.names == Names::beginningSo ? beginsWith(name, page.name) : name == page.name;
 }
 
 bool isFixed(const StatusPage &page, PlatformCode platform) {
@@ -49,10 +54,7 @@ std::list<std::string> fixedPages(PlatformCode platform) {
     return names;
 }
 
-const StatusPage *findStatusPage(const std::string &name) {
-    for (const auto &page : table) {
-        if (isOf(page, name))
-            return &page;
-    }
-    return nullptr;
+const StatusPage &statusPageOf(const std::string &name) {
+    return *std::find_if(std::begin(table), std::end(table),
+                         [&](const StatusPage &page) { return isOf(page, name); });
 }

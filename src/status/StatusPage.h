@@ -13,7 +13,7 @@ struct StatusPage {
     enum class Names {
         one,           ///< the page of this name; every appliance has it
         oneOnHardware, ///< the page of this name; only the hardware models have it
-        ports,         ///< the pages of the network ports whose names begin so
+        beginningSo,   ///< the pages of the network ports whose names begin so
     };
     using Text = std::string (*)(const std::string &name, PlatformCode platform);
     using Settings = Menu *(*)(const std::string &name);
@@ -27,5 +27,5 @@ struct StatusPage {
 /// The names of the pages that are there whatever ports the appliance has, in their order.
 [[nodiscard]] std::list<std::string> fixedPages(PlatformCode platform);
 
-/// The row that a page's name belongs to, or null.
-[[nodiscard]] const StatusPage *findStatusPage(const std::string &name);
+/// The row that a page's name belongs to: the first that fits, and one fits every name.
+[[nodiscard]] const StatusPage &statusPageOf(const std::string &name);
