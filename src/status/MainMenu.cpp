@@ -84,9 +84,9 @@ void MainMenu::onEscape(MenuContext *) {
     rotation.resume();
 }
 
-// The filter stops only long holds. Any of the first five polls may act, and once is enough: the
-// screen that is opened takes the held key for no new press. A key that was leant on for longer,
-// through an apply and back to the pages, opens nothing.
+// The filter stops only long holds: any of the first five polls of a press may act. One is enough,
+// since the screen that is opened takes the held key for no new press. A key that is leant on for
+// longer opens nothing.
 void MainMenu::onEnter(MenuContext *context) {
     if (panel->isHeldLong(keyEnter))
         return;
