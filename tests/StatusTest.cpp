@@ -154,7 +154,7 @@ TEST(Status, TheModelDecidesTheBannerAndTheConnectionPage) {
 
 TEST(Status, PortsAreListedWhenTheyHaveAnAddressAndASignalListsThemAgain) {
     world().portAddresses = {
-        {"eth0", ""}, {"eth1", "10.2.2.2"}, {"eth4", ""}, {"bridge0", "10.9.9.9"}};
+        {"eth0", ""}, {"eth1", "10.2.2.2"}, {"eth4", ""}, {"bridge1", "10.9.9.9"}};
     Operator person;
     person.poll();
     const auto pages = [&] {
@@ -164,7 +164,7 @@ TEST(Status, PortsAreListedWhenTheyHaveAnAddressAndASignalListsThemAgain) {
             titles += Operator::sees() + ";";
         return titles;
     };
-    EXPECT_EQ(pages(), "E0/E1 (bridge0)|10.9.9.9;E1 (eth1)|10.2.2.2;E4 (eth4)|unused;"
+    EXPECT_EQ(pages(), "E2/E3 (bridge1)|10.9.9.9;E1 (eth1)|10.2.2.2;E4 (eth4)|unused;"
                        "E5 (eth5)|unused;");
     world().portAddresses = {{"eth0", "10.1.1.1"}, {"wlan0", "10.3.3.3"}};
     world().events.clear();
