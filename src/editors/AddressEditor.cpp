@@ -1,7 +1,7 @@
 #include "editors/AddressEditor.h"
 
 #include "editors/OctetKeys.h"
-#include "parts/keyFilters.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
 
 namespace {

@@ -2,7 +2,7 @@
 
 #include "editors/DottedQuad.h"
 #include "editors/EditedAddress.h"
-#include "parts/DrawnOnce.h"
+#include "runtime/DrawnOnce.h"
 
 #include <cstdint>
 

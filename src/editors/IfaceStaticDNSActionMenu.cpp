@@ -3,9 +3,9 @@
 #include "editors/IfaceStaticEditDNSMenu.h"
 #include "editors/IfaceStaticListDNSMenu.h"
 #include "netconfig/NetworkConfig.h"
-#include "parts/drawMarkers.h"
-#include "parts/keyFilters.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
+#include "runtime/drawMarkers.h"
 
 void IfaceStaticDNSActionMenu::display(MenuContext *) {
     if (!drawn.isDue())

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "editors/EditedAddress.h"
-#include "parts/DrawnOnce.h"
+#include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
 #include "runtime/onlyOne.h"
 

@@ -4,7 +4,7 @@
 #include "editors/IfaceStaticDNSActionMenu.h"
 #include "netconfig/IfaceStaticMenu.h"
 #include "netconfig/NetworkConfig.h"
-#include "parts/keyFilters.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
 
 #include <algorithm>

@@ -1,11 +1,11 @@
 #include "hostname/HostnameApplyMenu.h"
 
 #include "hostname/HostnameEditMenu.h"
-#include "parts/confirmationText.h"
-#include "parts/keyFilters.h"
-#include "parts/showFor.h"
+#include "runtime/ConfigurationScript.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
-#include "runtime/configurationScript.h"
+#include "runtime/confirmationText.h"
+#include "runtime/showFor.h"
 #include "status/MainMenu.h"
 
 namespace {

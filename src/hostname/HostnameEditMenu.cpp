@@ -1,7 +1,7 @@
 #include "hostname/HostnameEditMenu.h"
 
 #include "hostname/HostnameApplyMenu.h"
-#include "parts/keyFilters.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
 #include "runtime/runCommand.h"
 #include "status/MainMenu.h"

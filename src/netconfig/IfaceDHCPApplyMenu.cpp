@@ -2,9 +2,9 @@
 
 #include "netconfig/IfaceTypeMenu.h"
 #include "netconfig/NetworkConfig.h"
-#include "parts/confirmationText.h"
-#include "parts/keyFilters.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
+#include "runtime/confirmationText.h"
 #include "status/MainMenu.h"
 
 void IfaceDHCPApplyMenu::display(MenuContext *) {

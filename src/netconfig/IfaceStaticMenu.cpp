@@ -7,9 +7,9 @@
 #include "editors/IfaceStaticListDNSMenu.h"
 #include "netconfig/IfaceTypeMenu.h"
 #include "netconfig/NetworkConfig.h"
-#include "parts/keyFilters.h"
-#include "parts/showFor.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
+#include "runtime/showFor.h"
 #include "status/MainMenu.h"
 
 #include <iterator>

@@ -1,7 +1,7 @@
 #pragma once
 
-#include "parts/DrawnOnce.h"
-#include "parts/ListWindow.h"
+#include "runtime/DrawnOnce.h"
+#include "runtime/ListWindow.h"
 #include "runtime/Menu.h"
 #include "runtime/onlyOne.h"
 

@@ -2,9 +2,9 @@
 
 #include "netconfig/IfaceDHCPApplyMenu.h"
 #include "netconfig/IfaceStaticMenu.h"
-#include "parts/drawMarkers.h"
-#include "parts/keyFilters.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
+#include "runtime/drawMarkers.h"
 #include "status/MainMenu.h"
 
 void IfaceTypeMenu::selectInterface(const std::string &name) {

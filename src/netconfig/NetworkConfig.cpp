@@ -1,7 +1,7 @@
 #include "netconfig/NetworkConfig.h"
 
+#include "runtime/ConfigurationScript.h"
 #include "runtime/beginsWith.h"
-#include "runtime/configurationScript.h"
 
 #include <fstream>
 #include <utility>

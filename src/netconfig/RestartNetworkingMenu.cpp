@@ -1,7 +1,7 @@
 #include "netconfig/RestartNetworkingMenu.h"
 
-#include "parts/showFor.h"
 #include "runtime/runCommand.h"
+#include "runtime/showFor.h"
 #include "status/MainMenu.h"
 
 #include <ace/OS_NS_sys_time.h>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "parts/DrawnOnce.h"
+#include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
 #include "runtime/onlyOne.h"
 

@@ -1,6 +1,6 @@
 #include "status/MainMenu.h"
 
-#include "parts/keyFilters.h"
+#include "runtime/KeyFilters.h"
 #include "runtime/LcdPanel.h"
 #include "status/NetworkPorts.h"
 #include "status/StatusPage.h"

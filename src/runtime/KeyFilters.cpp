@@ -1,4 +1,4 @@
-#include "parts/keyFilters.h"
+#include "runtime/KeyFilters.h"
 
 #include "runtime/LcdPanel.h"
 

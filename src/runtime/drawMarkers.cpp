@@ -1,4 +1,4 @@
-#include "parts/drawMarkers.h"
+#include "runtime/drawMarkers.h"
 
 #include "runtime/LcdPanel.h"
 

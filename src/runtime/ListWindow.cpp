@@ -1,7 +1,7 @@
-#include "parts/ListWindow.h"
+#include "runtime/ListWindow.h"
 
-#include "parts/drawMarkers.h"
 #include "runtime/LcdPanel.h"
+#include "runtime/drawMarkers.h"
 
 namespace {
 

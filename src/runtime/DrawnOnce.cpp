@@ -1,4 +1,4 @@
-#include "parts/DrawnOnce.h"
+#include "runtime/DrawnOnce.h"
 
 #include "runtime/Menu.h"
 

@@ -1,4 +1,4 @@
-#include "parts/showFor.h"
+#include "runtime/showFor.h"
 
 #include "runtime/LcdPanel.h"
 #include "runtime/pauseFor.h"

@@ -1,4 +1,4 @@
-#include "runtime/configurationScript.h"
+#include "runtime/ConfigurationScript.h"
 
 #include "runtime/beginsWith.h"
 #include "runtime/runCommand.h"
