@@ -3,13 +3,13 @@
 #include "editors/EditedAddress.h"
 #include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 /// Asks whether a DNS server is to be edited or deleted. A deletion is not asked about again.
 class IfaceStaticDNSActionMenu : public Menu {
   public:
     static IfaceStaticDNSActionMenu *instance() {
-        return onlyOne([] { return new IfaceStaticDNSActionMenu; });
+        static auto *const only = new IfaceStaticDNSActionMenu;
+        return only;
     }
 
     /// Not owned. To be called before the screen is made current.

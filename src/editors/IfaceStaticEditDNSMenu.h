@@ -2,13 +2,13 @@
 
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 /// Adds a DNS server to the port in work, or changes one of those that it has.
 class IfaceStaticEditDNSMenu : public Menu {
   public:
     static IfaceStaticEditDNSMenu *instance() {
-        return onlyOne([] { return new IfaceStaticEditDNSMenu; });
+        static auto *const only = new IfaceStaticEditDNSMenu;
+        return only;
     }
 
     /// Not owned. To be called before the screen is made current.

@@ -2,13 +2,13 @@
 
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 /// Edits the default gateway of the port in work.
 class IfaceStaticEditGWMenu : public Menu {
   public:
     static IfaceStaticEditGWMenu *instance() {
-        return onlyOne([] { return new IfaceStaticEditGWMenu; });
+        static auto *const only = new IfaceStaticEditGWMenu;
+        return only;
     }
 
     /// Not owned. To be called before the screen is made current.

@@ -2,13 +2,13 @@
 
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 /// Edits the address of the port in work.
 class IfaceStaticEditIPMenu : public Menu {
   public:
     static IfaceStaticEditIPMenu *instance() {
-        return onlyOne([] { return new IfaceStaticEditIPMenu; });
+        static auto *const only = new IfaceStaticEditIPMenu;
+        return only;
     }
 
     /// Not owned. To be called before the screen is made current.

@@ -2,13 +2,13 @@
 
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 /// Edits the netmask of the port in work.
 class IfaceStaticEditNMMenu : public Menu {
   public:
     static IfaceStaticEditNMMenu *instance() {
-        return onlyOne([] { return new IfaceStaticEditNMMenu; });
+        static auto *const only = new IfaceStaticEditNMMenu;
+        return only;
     }
 
     /// Not owned. To be called before the screen is made current.

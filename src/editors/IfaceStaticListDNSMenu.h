@@ -3,7 +3,6 @@
 #include "runtime/DrawnOnce.h"
 #include "runtime/ListWindow.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 #include <array>
 #include <cstdint>
@@ -16,7 +15,8 @@ class NetworkConfig;
 class IfaceStaticListDNSMenu : public Menu {
   public:
     static IfaceStaticListDNSMenu *instance() {
-        return onlyOne([] { return new IfaceStaticListDNSMenu; });
+        static auto *const only = new IfaceStaticListDNSMenu;
+        return only;
     }
 
     /// Not owned. To be called before the screen is made current.

@@ -3,7 +3,6 @@
 #include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
 #include "runtime/String.h"
-#include "runtime/onlyOne.h"
 
 #include <string>
 
@@ -12,7 +11,8 @@
 class HostnameApplyMenu : public Menu {
   public:
     static HostnameApplyMenu *instance() {
-        return onlyOne([] { return new HostnameApplyMenu; });
+        static auto *const only = new HostnameApplyMenu;
+        return only;
     }
 
     /// Takes the name without the blanks around it. To be called before the screen is made current.

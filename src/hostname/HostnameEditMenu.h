@@ -2,7 +2,6 @@
 
 #include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 #include <cstdint>
 #include <string>
@@ -14,7 +13,8 @@
 class HostnameEditMenu : public Menu {
   public:
     static HostnameEditMenu *instance() {
-        return onlyOne([] { return new HostnameEditMenu; });
+        static auto *const only = new HostnameEditMenu;
+        return only;
     }
 
     void display(MenuContext *context) override;

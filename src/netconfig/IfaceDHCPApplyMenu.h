@@ -2,7 +2,6 @@
 
 #include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 class NetworkConfig;
 
@@ -11,7 +10,8 @@ class NetworkConfig;
 class IfaceDHCPApplyMenu : public Menu {
   public:
     static IfaceDHCPApplyMenu *instance() {
-        return onlyOne([] { return new IfaceDHCPApplyMenu; });
+        static auto *const only = new IfaceDHCPApplyMenu;
+        return only;
     }
 
     /// Not owned. To be called before the screen is made current.

@@ -3,7 +3,6 @@
 #include "runtime/DrawnOnce.h"
 #include "runtime/ListWindow.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 #include <string>
 
@@ -13,7 +12,8 @@ class NetworkConfig;
 class IfaceStaticMenu : public Menu {
   public:
     static IfaceStaticMenu *instance() {
-        return onlyOne([] { return new IfaceStaticMenu; });
+        static auto *const only = new IfaceStaticMenu;
+        return only;
     }
 
     /// Not owned. To be called before the screen is made current.

@@ -3,7 +3,6 @@
 #include "netconfig/NetworkConfig.h"
 #include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 #include <memory>
 #include <string>
@@ -13,7 +12,8 @@
 class IfaceTypeMenu : public Menu {
   public:
     static IfaceTypeMenu *instance() {
-        return onlyOne([] { return new IfaceTypeMenu; });
+        static auto *const only = new IfaceTypeMenu;
+        return only;
     }
 
     /// Replaces the settings in work by those that the system's files hold for this port. To be

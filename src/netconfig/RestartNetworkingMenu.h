@@ -2,7 +2,6 @@
 
 #include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 
 #include <ace/Time_Value.h>
 
@@ -14,7 +13,8 @@
 class RestartNetworkingMenu : public Menu {
   public:
     static RestartNetworkingMenu *instance() {
-        return onlyOne([] { return new RestartNetworkingMenu; });
+        static auto *const only = new RestartNetworkingMenu;
+        return only;
     }
 
     /// Blocks for 1 s when the screen is first drawn, then looks for the restart's processes at

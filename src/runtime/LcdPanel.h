@@ -5,7 +5,6 @@
 #include "runtime/Marquee.h"
 #include "runtime/SerialLine.h"
 #include "runtime/String.h"
-#include "runtime/onlyOne.h"
 
 #include <cstdint>
 #include <string>
@@ -21,7 +20,8 @@ class LcdPanel {
     /// The one panel. The first call opens and configures the line and clears the display; it ends
     /// the process with status 150 when the line cannot be configured.
     static LcdPanel *instance() {
-        return onlyOne([] { return new LcdPanel; });
+        static auto *const only = new LcdPanel;
+        return only;
     }
 
     /// Sends the prefix and one command byte. -1 when the prefix could not be written (the command

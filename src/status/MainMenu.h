@@ -1,7 +1,6 @@
 #pragma once
 
 #include "runtime/Menu.h"
-#include "runtime/onlyOne.h"
 #include "status/PlatformCode.h"
 #include "status/RotationTimer.h"
 
@@ -15,7 +14,8 @@
 class MainMenu : public Menu {
   public:
     static MainMenu *instance() {
-        return onlyOne([] { return new MainMenu; });
+        static auto *const only = new MainMenu;
+        return only;
     }
 
     /// Asks the next `display` to look for ports anew and to start again at the first page. Safe in
