@@ -21,7 +21,7 @@ void AddressEditor::editForOneVisit(const EditedAddress &row, ServerIndex index)
 }
 
 void AddressEditor::display() {
-    if (!drawn.isDue() || config == nullptr)
+    if (!drawn.claimDrawing() || config == nullptr)
         return;
     std::string text = address->shown(*config, serverIndex);
     parseDottedQuad(text, octets);

@@ -8,7 +8,7 @@
 #include "runtime/drawMarkers.h"
 
 void IfaceStaticDNSActionMenu::display(MenuContext *) {
-    if (!drawn.isDue())
+    if (!drawn.claimDrawing())
         return;
     panel->showText("  Edit Svr\n  Delete Svr");
     drawMarkers(panel, deleteSelected ? 1 : 0);

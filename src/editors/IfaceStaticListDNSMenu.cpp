@@ -42,7 +42,7 @@ std::string IfaceStaticListDNSMenu::renderList() const {
 }
 
 void IfaceStaticListDNSMenu::display(MenuContext *) {
-    if (!drawn.isDue() || config == nullptr)
+    if (!drawn.claimDrawing() || config == nullptr)
         return;
     readServers();
     // The last server or a place past it: whoever was there starts again at the first, and is not

@@ -33,7 +33,7 @@ void HostnameApplyMenu::applyHostname() {
 }
 
 void HostnameApplyMenu::display(MenuContext *) {
-    if (drawn.isDue())
+    if (drawn.claimDrawing())
         panel->showText(confirmationText);
 }
 

@@ -23,7 +23,7 @@ constexpr int nameRow = 1;
 } // namespace
 
 void HostnameEditMenu::display(MenuContext *) {
-    if (!drawn.isDue())
+    if (!drawn.claimDrawing())
         return;
     hostname = runCommand("hostname", true);
     if (!hostname.empty())

@@ -8,7 +8,7 @@
 #include "status/MainMenu.h"
 
 void IfaceDHCPApplyMenu::display(MenuContext *) {
-    if (drawn.isDue())
+    if (drawn.claimDrawing())
         panel->showText(confirmationText);
 }
 

@@ -56,7 +56,7 @@ std::string IfaceStaticMenu::renderItems() const {
 }
 
 void IfaceStaticMenu::display(MenuContext *) {
-    if (drawn.isDue())
+    if (drawn.claimDrawing())
         panel->showText(renderItems());
 }
 

@@ -13,7 +13,7 @@ void IfaceTypeMenu::selectInterface(const std::string &name) {
 }
 
 void IfaceTypeMenu::display(MenuContext *) {
-    if (!drawn.isDue())
+    if (!drawn.claimDrawing())
         return;
     const bool dhcpChosen = config != nullptr && config->isDhcp();
     panel->showText(dhcpChosen ? "> DHCP\n  Static" : "  DHCP\n> Static");

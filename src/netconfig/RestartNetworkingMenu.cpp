@@ -18,7 +18,7 @@ constexpr const char *restartProcesses =
 const ACE_Time_Value RestartNetworkingMenu::pollInterval(1);
 
 void RestartNetworkingMenu::display(MenuContext *context) {
-    if (drawn.isDue())
+    if (drawn.claimDrawing())
         showFor(panel, firstPause, "Restarting\nNetworking");
     const ACE_Time_Value now = ACE_OS::gettimeofday();
     if (!(now - lastPoll > pollInterval))

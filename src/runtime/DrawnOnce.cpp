@@ -4,7 +4,7 @@
 
 #include <utility>
 
-bool DrawnOnce::isDue() {
+bool DrawnOnce::claimDrawing() {
     return !std::exchange(drawn, true);
 }
 

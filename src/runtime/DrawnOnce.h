@@ -4,16 +4,18 @@ class Menu;
 class MenuContext;
 
 /// Lets a screen draw itself whole once per visit, although it is asked to draw on every turn: a
-/// redraw keeps the line busy for 180 ms.
+/// redraw keeps the line busy for 180 ms. A screen is left through this part too, so that none can
+/// be left without being drawn on the next visit.
 class DrawnOnce {
   public:
     explicit DrawnOnce(Menu *owner) : screen(owner) {}
 
-    /// True when the screen has to be drawn; from then on false until one of the calls below.
-    [[nodiscard]] bool isDue();
+    /// True on the first call, for the caller that is to draw the screen now. False from then on,
+    /// until one of the calls below.
+    [[nodiscard]] bool claimDrawing();
     /// The screen stays, but something else has been shown over it.
     void drawAgain() { drawn = false; }
-    /// Leaves the screen for `next`. The screen will be drawn whole when it is visited again.
+    /// Makes `next` the current screen. This one will be drawn whole when it is visited again.
     void leaveFor(MenuContext *context, Menu *next);
 
   private:
