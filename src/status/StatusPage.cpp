@@ -2,10 +2,8 @@
 
 #include "hostname/HostnameEditMenu.h"
 #include "netconfig/IfaceTypeMenu.h"
-#include "runtime/beginsWith.h"
 #include "status/PageTexts.h"
 
-#include <algorithm>
 #include <iterator>
 
 namespace {
@@ -22,25 +20,49 @@ Menu *portSettings(const std::string &name) {
 }
 
 using Names = StatusPage::Names;
-using Name = const std::string &;
 constexpr StatusPage table[] = {
-    {Names::one, "product", [](Name, PlatformCode model) { return productText(model); }, nothing},
-    {Names::one, "hostname", [](Name, PlatformCode) { return hostnameText(); }, hostnameEditor},
-    {Names::oneOnHardware, "connection", [](Name, PlatformCode) { return connectionText(); },
-     nothing},
-    {Names::beginningSo, "bridge", [](Name port, PlatformCode) { return interfaceText(port); },
-     nothing},
-    {Names::beginningSo, "eth", [](Name port, PlatformCode) { return interfaceText(port); },
-     portSettings},
-    {Names::beginningSo, "", [](Name, PlatformCode) { return std::string("undefined"); }, nothing},
+    {Names::exactly, "product",
+     [](const std::string &, PlatformCode model) { return productText(model); }, nothing},
+    {Names::exactly, "hostname", [](const std::string &, PlatformCode) { return hostnameText(); },
+     hostnameEditor},
+    {Names::exactlyOnHardware, "connection",
+     [](const std::string &, PlatformCode) { return connectionText(); }, nothing},
+    {Names::startingWith, "bridge",
+     [](const std::string &port, PlatformCode) { return interfaceText(port); }, nothing},
+    {Names::startingWith, "eth",
+     [](const std::string &port, PlatformCode) { return interfaceText(port); }, portSettings},
+    {Names::startingWith, "",
+     [](const std::string &, PlatformCode) { return std::string("undefined"); }, nothing},
 };
 
-bool isOf(const StatusPage &page, const std::string &name) {
-    return page.names == Names::beginningSo ? beginsWith(name, page.name) : name == page.name;
+constexpr const StatusPage &fallback = table[std::size(table) - 1];
+static_assert(fallback.names == Names::startingWith && fallback.name.empty(),
+              "the last row fits every name");
+
+constexpr bool fits(const StatusPage &page, std::string_view name) {
+    return page.names == Names::startingWith ? name.substr(0, page.name.length()) == page.name
+                                             : name == page.name;
 }
 
+constexpr const StatusPage *firstThatFits(std::string_view name) {
+    const StatusPage *page = table;
+    while (!fits(*page, name))
+        ++page;
+    return page;
+}
+
+constexpr bool everyRowCanBeReached() {
+    for (const auto &page : table) {
+        if (firstThatFits(page.name) != &page)
+            return false;
+    }
+    return true;
+}
+static_assert(everyRowCanBeReached(), "no row stands behind one that takes all its names");
+
 bool isFixed(const StatusPage &page, PlatformCode platform) {
-    return page.names == Names::one || (page.names == Names::oneOnHardware && isHardware(platform));
+    return page.names == Names::exactly ||
+           (page.names == Names::exactlyOnHardware && isHardware(platform));
 }
 
 } // namespace
@@ -55,6 +77,5 @@ std::list<std::string> fixedPages(PlatformCode platform) {
 }
 
 const StatusPage &statusPageOf(const std::string &name) {
-    return *std::find_if(std::begin(table), std::end(table),
-                         [&](const StatusPage &page) { return isOf(page, name); });
+    return *firstThatFits(name);
 }

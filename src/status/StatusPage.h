@@ -11,9 +11,9 @@ class Menu;
 
 struct StatusPage {
     enum class Names {
-        one,           ///< the page of this name; every appliance has it
-        oneOnHardware, ///< the page of this name; only the hardware models have it
-        beginningSo,   ///< the pages of the network ports whose names begin so
+        exactly,           ///< the page of this name; every appliance has it
+        exactlyOnHardware, ///< the page of this name; only the hardware models have it
+        startingWith,      ///< the pages of the network ports whose names start so
     };
     using Text = std::string (*)(const std::string &name, PlatformCode platform);
     using Settings = Menu *(*)(const std::string &name);
