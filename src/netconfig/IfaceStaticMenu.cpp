@@ -14,8 +14,17 @@
 
 #include <iterator>
 
+namespace {
+
+constexpr std::size_t labelColumns = 13; // between the marker with its blank and the indicator
+static_assert(2 + labelColumns + 1 == LcdPanel::visibleColumns);
+
+constexpr std::chrono::seconds errorTime{3};
+
+} // namespace
+
 struct IfaceStaticMenu::Item {
-    const char *label;
+    char label[labelColumns + 1]; // an array, so that a label that is too long does not compile
     void (IfaceStaticMenu::*enter)(MenuContext *context);
 };
 
@@ -28,16 +37,9 @@ const IfaceStaticMenu::Item IfaceStaticMenu::items[] = {
     {"Apply Changes", &IfaceStaticMenu::applyChanges},
 };
 
-namespace {
-
-constexpr std::size_t labelColumns = 13; // between the marker with its blank and the indicator
-static_assert(2 + labelColumns + 1 == LcdPanel::visibleColumns);
-
-constexpr std::chrono::seconds errorTime{3};
-
-} // namespace
-
 bool IfaceStaticMenu::applyStatic() {
+    if (config == nullptr)
+        return false;
     const std::string error = config->apply();
     if (error.empty())
         return true;

@@ -23,8 +23,8 @@ class IfaceStaticMenu : public Menu {
     /// "^" or "v" where the list goes on.
     [[nodiscard]] std::string renderItems() const;
 
-    /// Applies the settings and waits for the outcome. False when they were refused; the reason has
-    /// then been on the panel for 3 s, during which no key is read.
+    /// Applies the settings and waits for the outcome. False without settings, and when they were
+    /// refused; the reason has then been on the panel for 3 s, during which no key is read.
     [[nodiscard]] bool applyStatic();
 
     void display(MenuContext *context) override;
