@@ -11,7 +11,7 @@ void IfaceStaticDNSActionMenu::display(MenuContext *) {
     if (!drawn.claimDrawing())
         return;
     panel->showText("  Edit Svr\n  Delete Svr");
-    drawMarkers(panel, deleteSelected ? 1 : 0);
+    drawMarkers(deleteSelected ? 1 : 0);
 }
 
 // Up and Down have no hold filter: the marker stops at once, so a held key has nothing to repeat.
@@ -27,7 +27,11 @@ void IfaceStaticDNSActionMenu::onDown(MenuContext *) {
 
 void IfaceStaticDNSActionMenu::select(bool deletion) {
     deleteSelected = deletion;
-    drawMarkers(panel, deletion ? 1 : 0);
+    drawMarkers(deletion ? 1 : 0);
+}
+
+void IfaceStaticDNSActionMenu::drawMarkers(int row) {
+    ::drawMarkers(panel, row);
 }
 
 void IfaceStaticDNSActionMenu::onEscape(MenuContext *context) {

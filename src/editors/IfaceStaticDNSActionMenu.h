@@ -17,6 +17,9 @@ class IfaceStaticDNSActionMenu : public Menu {
     /// Position of the server to be acted on.
     void setServerIndex(ServerIndex index) { serverIndex = index; }
 
+    /// Shows the marker on `row`, 0 or 1. The choice itself stays.
+    void drawMarkers(int row);
+
     void display(MenuContext *context) override;
     void onUp(MenuContext *context) override;
     void onDown(MenuContext *context) override;
@@ -27,8 +30,8 @@ class IfaceStaticDNSActionMenu : public Menu {
     IfaceStaticDNSActionMenu() = default;
 
     void select(bool deletion);
-    Menu *deleteServer();
-    Menu *editServer();
+    [[nodiscard]] Menu *deleteServer();
+    [[nodiscard]] Menu *editServer();
 
     DrawnOnce drawn{this};
     NetworkConfig *config = nullptr;

@@ -45,8 +45,8 @@ void IfaceStaticListDNSMenu::display(MenuContext *) {
     if (!drawn.claimDrawing() || config == nullptr)
         return;
     readServers();
-    // The last server or a place past it: whoever was there starts again at the first, and is not
-    // left on a server that has just moved up into the place of a deleted one.
+    // The last server, or a place past the end: the selection starts again at the first, so that it
+    // never points at a server that is gone.
     if (window.selected() >= serverCount - 1)
         window.selectFirst();
     panel->showText(renderList());

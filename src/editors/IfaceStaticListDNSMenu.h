@@ -10,8 +10,8 @@
 
 class NetworkConfig;
 
-/// The DNS servers of the port in work, two at a time; Enter opens what can be done with one. Only
-/// the first ten can be reached from the panel.
+/// The DNS servers of the port being configured, two at a time; Enter opens what can be done with
+/// one. Only the first ten can be reached from the panel.
 class IfaceStaticListDNSMenu : public Menu {
   public:
     static IfaceStaticListDNSMenu *instance() {
@@ -24,6 +24,8 @@ class IfaceStaticListDNSMenu : public Menu {
 
     /// The servers in the window, with the marker in front of them.
     [[nodiscard]] std::string renderList() const;
+    /// Moves the marker to `row`, 0 or 1, without drawing the servers again.
+    void drawMarkers(int row) { window.drawMarkers(row); }
 
     void display(MenuContext *context) override;
     void onUp(MenuContext *context) override;
@@ -39,7 +41,7 @@ class IfaceStaticListDNSMenu : public Menu {
 
     DrawnOnce drawn{this};
     NetworkConfig *config = nullptr;
-    std::array<std::string, 10> servers;
-    std::int32_t serverCount = 0; ///< as the settings reported it; may exceed what is stored
+    std::array<std::string, 10> servers; ///< ten: the system itself asks only three
+    std::int32_t serverCount = 0;        ///< as the settings reported it; may exceed what is stored
     ListWindow window{panel};
 };

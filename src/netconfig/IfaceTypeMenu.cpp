@@ -16,7 +16,8 @@ void IfaceTypeMenu::display(MenuContext *) {
     if (!drawn.claimDrawing())
         return;
     const bool dhcpChosen = config != nullptr && config->isDhcp();
-    panel->showText(dhcpChosen ? "> DHCP\n  Static" : "  DHCP\n> Static");
+    panel->showText(std::string(1, rowMarker(dhcpChosen)) + " DHCP\n" + rowMarker(!dhcpChosen) +
+                    " Static");
 }
 
 // Up and Down have no hold filter: the marker stops at once, so a held key has nothing to repeat.

@@ -16,8 +16,8 @@ class IfaceTypeMenu : public Menu {
         return only;
     }
 
-    /// Replaces the settings in work by those that the system's files hold for this port. To be
-    /// called before the screen is made current.
+    /// Replaces the settings that are being edited by those that the system's files hold for this
+    /// port. To be called before the screen is made current.
     void selectInterface(const std::string &name);
 
     void display(MenuContext *context) override;

@@ -1,7 +1,6 @@
 #include "runtime/ListWindow.h"
 
 #include "runtime/LcdPanel.h"
-#include "runtime/drawMarkers.h"
 
 namespace {
 
@@ -11,7 +10,7 @@ constexpr int bottomRow = LcdPanel::rows - 1;
 
 bool ListWindow::up() {
     if (cursorRow > 0) {
-        moveMarkerTo(cursorRow - 1);
+        drawMarkers(cursorRow - 1);
         return false;
     }
     if (!hasEntriesAbove())
@@ -24,7 +23,7 @@ bool ListWindow::down(std::int32_t listLength) {
     if (selected() + 1 >= listLength)
         return false;
     if (cursorRow < bottomRow) {
-        moveMarkerTo(cursorRow + 1);
+        drawMarkers(cursorRow + 1);
         return false;
     }
     ++top;
@@ -40,7 +39,7 @@ bool ListWindow::hasEntriesBelow(std::int32_t listLength) const {
     return entryOn(bottomRow) + 1 < listLength;
 }
 
-void ListWindow::moveMarkerTo(int row) {
-    drawMarkers(panel, row);
+void ListWindow::drawMarkers(int row) {
+    ::drawMarkers(panel, row);
     cursorRow = row;
 }

@@ -1,12 +1,14 @@
 #pragma once
 
+#include "runtime/drawMarkers.h"
+
 #include <cstdint>
 
 class LcdPanel;
 
 /// The two rows of the panel as a window on a list, with a marker on the selected row. The marker
-/// moves within the window first; the window scrolls when the marker is at its edge. There is no
-/// way round from one end of the list to the other.
+/// moves within the window first; the window scrolls when the marker is at its edge. The list
+/// does not wrap around.
 class ListWindow {
   public:
     explicit ListWindow(LcdPanel *thePanel) : panel(thePanel) {}
@@ -17,19 +19,18 @@ class ListWindow {
     [[nodiscard]] bool up();
     [[nodiscard]] bool down(std::int32_t listLength);
     void selectFirst();
+    /// Moves the marker to `row`, 0 or 1, on the panel too: the entry there is the selected one.
+    void drawMarkers(int row);
 
     /// Position in the list, from 0.
     [[nodiscard]] std::int32_t selected() const { return top + cursorRow; }
     [[nodiscard]] std::int32_t entryOn(int row) const { return top + row; }
-    /// '>' on the selected row, a blank on the other.
-    [[nodiscard]] char marker(int row) const { return row == cursorRow ? '>' : ' '; }
+    [[nodiscard]] char marker(int row) const { return rowMarker(row == cursorRow); }
 
     [[nodiscard]] bool hasEntriesAbove() const { return top > 0; }
     [[nodiscard]] bool hasEntriesBelow(std::int32_t listLength) const;
 
   private:
-    void moveMarkerTo(int row);
-
     LcdPanel *panel;
     std::int32_t top = 0; ///< the entry on row 0
     int cursorRow = 0;

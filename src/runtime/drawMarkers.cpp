@@ -5,6 +5,7 @@
 void drawMarkers(LcdPanel *panel, int row) {
     for (int each = 0; each < LcdPanel::rows; ++each) {
         panel->setCursor(each, 0);
-        panel->writeAtCursor(each == row ? ">" : " ", 1);
+        const char marker = rowMarker(each == row);
+        panel->writeAtCursor(&marker, 1);
     }
 }
