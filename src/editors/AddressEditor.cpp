@@ -12,11 +12,11 @@ constexpr std::int32_t lastOctet = 3;
 
 } // namespace
 
-AddressEditor::AddressEditor(Menu *screen, const EditedAddress &row)
-    : panel(LcdPanel::instance()), drawn(screen), ownAddress(row), address(&row) {}
+AddressEditor::AddressEditor(Menu *screen, const EditedAddress &edited)
+    : panel(LcdPanel::instance()), drawn(screen), ownAddress(edited), address(&edited) {}
 
-void AddressEditor::editForOneVisit(const EditedAddress &row, ServerIndex index) {
-    address = &row;
+void AddressEditor::editForOneVisit(const EditedAddress &edited, ServerIndex index) {
+    address = &edited;
     serverIndex = index;
 }
 

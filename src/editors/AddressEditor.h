@@ -14,16 +14,15 @@ class NetworkConfig;
 /// What the four address screens have in common: an address on row 1, with the cursor blinking on
 /// the last digit of one octet. Up and Down change that octet; Enter walks on and, on the last
 /// octet, stores the address; Escape walks back and, on the first, leaves without storing. Which
-/// address it is, and where the screen leads, stands in its row of the table of addresses.
+/// address it is, and where the screen leads, is said by an `EditedAddress`.
 class AddressEditor {
   public:
-    /// The editor on `screen`, of the address that is described by `row`.
-    AddressEditor(Menu *screen, const EditedAddress &row);
+    AddressEditor(Menu *screen, const EditedAddress &edited);
 
     /// Not owned. Without it nothing is drawn and nothing stored.
     void setConfig(NetworkConfig *settings) { config = settings; }
     /// Edits another address, one in the list of servers, until the screen is left.
-    void editForOneVisit(const EditedAddress &row, ServerIndex index);
+    void editForOneVisit(const EditedAddress &edited, ServerIndex index);
 
     void display();
     void onUp();

@@ -1,4 +1,4 @@
-// The addresses that can be edited, as a table: one row for each way into an address editor.
+// The addresses that can be edited: one description for each way into an address editor.
 #pragma once
 
 #include <cstdint>

@@ -3,7 +3,7 @@
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
 
-/// Adds a DNS server to the port in work, or changes one of those that it has.
+/// Adds a DNS server to the port being configured, or changes one of those that it has.
 class IfaceStaticEditDNSMenu : public Menu {
   public:
     static IfaceStaticEditDNSMenu *instance() {

@@ -3,7 +3,7 @@
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
 
-/// Edits the default gateway of the port in work.
+/// Edits the default gateway of the port being configured.
 class IfaceStaticEditGWMenu : public Menu {
   public:
     static IfaceStaticEditGWMenu *instance() {

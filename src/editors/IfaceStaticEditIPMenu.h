@@ -3,7 +3,7 @@
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
 
-/// Edits the address of the port in work.
+/// Edits the address of the port being configured.
 class IfaceStaticEditIPMenu : public Menu {
   public:
     static IfaceStaticEditIPMenu *instance() {

@@ -3,7 +3,7 @@
 #include "editors/AddressEditor.h"
 #include "runtime/Menu.h"
 
-/// Edits the netmask of the port in work.
+/// Edits the netmask of the port being configured.
 class IfaceStaticEditNMMenu : public Menu {
   public:
     static IfaceStaticEditNMMenu *instance() {
