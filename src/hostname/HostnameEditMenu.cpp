@@ -14,8 +14,8 @@ const std::string hostnameAlphabet =
     "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789-";
 constexpr std::int32_t hyphenIndex = 62; // the last
 
-constexpr char blank = ' '; // a position without a character
-constexpr std::size_t bufferLength = LcdPanel::columns;
+constexpr char blank = ' ';                             // a position without a character
+constexpr std::size_t bufferLength = LcdPanel::columns; // as far as the cursor can go
 constexpr std::int32_t lastPosition = bufferLength - 1;
 constexpr std::int32_t lastVisiblePosition = LcdPanel::visibleColumns - 1;
 constexpr int nameRow = 1;

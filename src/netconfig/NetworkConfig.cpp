@@ -75,6 +75,8 @@ std::string NetworkConfig::apply() const {
         return "Invalid Netmask";
 
     const std::string options = (dhcp ? " --dhcp" : staticOptions()) + dnsOptions();
+    // Cannot happen, as each way above gives an option. The guard keeps a later change from running
+    // the script without any.
     if (options.empty())
         return "Unknown";
 

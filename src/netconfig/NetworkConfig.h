@@ -18,7 +18,8 @@ class NetworkConfig {
     void load();
 
     /// Hands the settings to the configuration script and waits for it. Returns "" on success, else
-    /// a message that fits a row of the panel; settings that cannot work are refused unasked.
+    /// a message that fits a row of the panel; settings that cannot work are refused without
+    /// asking the script.
     std::string apply() const;
 
     [[nodiscard]] std::string getName() const { return name; }
@@ -45,10 +46,10 @@ class NetworkConfig {
     [[nodiscard]] static bool isAddressSet(const std::string &text);
 
   private:
-    bool loadStanza();
+    [[nodiscard]] bool loadStanza();
     void loadDnsServers();
-    std::string staticOptions() const;
-    std::string dnsOptions() const;
+    [[nodiscard]] std::string staticOptions() const;
+    [[nodiscard]] std::string dnsOptions() const;
 
     std::string name;
     std::string address;

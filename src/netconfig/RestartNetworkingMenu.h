@@ -7,9 +7,9 @@
 
 /// Waits until the system has finished restarting its network, or until any key is pressed.
 ///
-/// No screen opens it: the configuration script returns only when the network is up again, so both
-/// applies go straight back to the status pages. It is kept, whole and tested, for a script that
-/// restarts the network in the background.
+/// Both applies wait for the script and go straight back to the status pages, so no screen opens
+/// this one. It is kept, whole and tested, for a script that restarts the network in the
+/// background.
 class RestartNetworkingMenu : public Menu {
   public:
     static RestartNetworkingMenu *instance() {

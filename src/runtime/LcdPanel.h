@@ -30,6 +30,8 @@ class LcdPanel {
     void clear();
     void home();
     /// Moves the cursor. Columns above 39 count as 39; rows other than 0 and 1 are ignored.
+    /// Negative columns are not limited: a host name may be too long for the row, but no screen
+    /// counts below its first column.
     void setCursor(int row, int column);
     void cursorLeft();
     void cursorRight();

@@ -21,7 +21,7 @@ void onRefreshSignal(int) {
 MainLoop::MainLoop(const std::function<Menu *()> &firstScreen, void (*requestRefresh)()) {
     refreshRequest = requestRefresh;
     signal(SIGUSR1, onRefreshSignal);
-    panel = LcdPanel::instance(); // opened long since, by an initialiser
+    panel = LcdPanel::instance(); // a static initialiser has opened it already
     context = new MenuContext(firstScreen());
 }
 

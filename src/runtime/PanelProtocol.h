@@ -1,4 +1,8 @@
 // Every byte value that the panel and the program agree on, in one table.
+//
+// The panel acknowledges nothing and cannot be asked what it has understood. So what looks needless
+// here stays as every panel in the field has been driven: the command before each key request, and
+// the way round into row 1.
 #pragma once
 
 #include <cstdint>
@@ -6,7 +10,7 @@
 namespace PanelCommand {
 constexpr std::uint8_t prefix = 0xFE; ///< goes before each of the commands below
 
-constexpr std::uint8_t beforeKeyRequest = 0x00;
+constexpr std::uint8_t beforeKeyRequest = 0x00; ///< shows nothing on the display
 constexpr std::uint8_t clear = 0x01;
 constexpr std::uint8_t home = 0x02;
 constexpr std::uint8_t readKey = 0x06; ///< answered by two bytes while a key is down, else by none

@@ -24,7 +24,7 @@ class SerialLine {
     ssize_t send(const void *bytes, std::size_t length);
 
     /// Waits until bytes come, at most `timeout` or until a signal, and takes those that are there.
-    Received receive(std::chrono::milliseconds timeout);
+    [[nodiscard]] Received receive(std::chrono::milliseconds timeout);
 
   private:
     int fd;

@@ -84,9 +84,9 @@ void MainMenu::onEscape(MenuContext *) {
     rotation.resume();
 }
 
-// The filter stops only long holds: any of the first five polls of a press may act. One is enough,
-// since the screen that is opened takes the held key for no new press. A key that is leant on for
-// longer opens nothing.
+// The filter stops only long holds, so each of the first five polls of a hold opens the page. A
+// press that begins here opens it on its first poll. An Enter that is still down after an apply
+// opens the port again on its second. Whoever holds the key for longer opens nothing more.
 void MainMenu::onEnter(MenuContext *context) {
     if (panel->isHeldLong(keyEnter))
         return;

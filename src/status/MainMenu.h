@@ -10,7 +10,8 @@
 
 /// The status display that the panel shows when nobody works on it, and to which every other screen
 /// returns: one page after the other, by itself or with Up and Down. Enter leads from the host
-/// name's and the ports' pages into their settings.
+/// name's and the ports' pages into their settings. Which pages there are, what they show and what
+/// Enter opens on them is said by the table in `StatusPage`.
 class MainMenu : public Menu {
   public:
     static MainMenu *instance() {

@@ -18,7 +18,8 @@ class RotationTimer {
     void pageTurned(int excess, const ACE_Time_Value &now);
     /// The operator has paged by hand, and gets a minute to read before the rotation goes on.
     void pageChosen(int excess);
-    /// The operator needs no minute: the page's ordinary time counts from when it was drawn.
+    /// The operator does not need the minute: the page's ordinary time counts from when it was
+    /// drawn.
     void resume();
     /// The second row has moved by one character.
     void scrolled(const ACE_Time_Value &now);
