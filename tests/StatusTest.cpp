@@ -150,6 +150,8 @@ TEST(Status, TheModelDecidesTheBannerAndTheConnectionPage) {
         person.poll();
         EXPECT_EQ(Operator::sees(), "|");
     });
+    world().files["/etc/ma-platform"] = "q75";
+    EXPECT_EQ(detectPlatform(), 1U); // its banner is that of a q70, but it is a model of its own
 }
 
 TEST(Status, PortsAreListedWhenTheyHaveAnAddressAndASignalListsThemAgain) {
