@@ -15,7 +15,11 @@ cannot() { # said loudly; where CI runs it has to be possible
     [ "${CI-}" != true ] && exit 0
     exit 1
 }
-must() { "$@" >"$work/log" 2>&1 || { cat "$work/log"; echo "FAILED $*"; exit 1; }; }
+give_up() {
+    echo "FAILED $*"
+    exit 1
+}
+must() { "$@" >"$work/log" 2>&1 || { cat "$work/log"; give_up "$@"; }; }
 export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
 container="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --directory=$root"
 leader() { cut -d " " -f 1 "/proc/$manager/task/$manager/children" 2>/dev/null; }
@@ -28,7 +32,8 @@ boot() {
         [ "$(inside systemctl is-system-running 2>&1)" != running ] || return 0
         sleep 0.5
     done
-    must false "$(cat "$work/boot")"
+    cat "$work/boot"
+    give_up "to start the system"
 }
 leftovers() {
     find "$root/etc" "$root/usr" "$root/var" -path '*/cache/apt' -prune -o \
@@ -107,7 +112,10 @@ must inside sh -ec '
         -- sleep infinity >/root/played 2>&1; systemctl poweroff"'
 must timeout 900 tail -f --pid=$manager /dev/null
 wait $manager
-[ $? -eq 133 ] || must false "no reboot was asked for: $(cat "$root/root/played")"
+[ $? -eq 133 ] || { # which is how a reboot ends it
+    cat "$root/root/played"
+    give_up "to come to the reboot"
+}
 echo "first byte on the line after $((($(head -n 1 "$root/root/trace" | cut -d ' ' -f 1) / 1000 -
     $(cat "$root/root/started")) / 1000)) ms"
 
