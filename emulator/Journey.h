@@ -1,8 +1,6 @@
 #pragma once
 
-#include "Clock.h"
-#include "Key.h"
-#include "Picture.h"
+#include "emulator/StepTable.h"
 
 #include <istream>
 #include <string>
@@ -10,47 +8,24 @@
 
 namespace emulator {
 
-/// An operator's journey: steps read from a text of one step a line, as `panel-emulator --help`
-/// lists them.
+/// An operator's journey, read from a text with one step a line (see StepTable).
 class Journey {
   public:
-    enum class Action {
-        tap,
-        hold,
-        release,
-        wait,
-        expect,
-        expectCursor,
-        picture,
-        say,
-        limit,
-        run,
-    };
+    /// Reads a whole journey that is to be played on `stage`. Throws std::invalid_argument with
+    /// "NAME:LINE: what is wrong".
+    Journey(std::istream &input, std::string name, Stage stage = Stage::panel);
 
-    /// A step; which fields beside the line number mean something depends on the action.
-    struct Step {
-        Action action = Action::release;
-        int line = 0;
-        Key key = Key::up;
-        int count = 1;          ///< taps, or polls of a hold
-        Clock::duration time{}; ///< of a wait or a limit
-        Picture::Rows rows;     ///< expected, padded to 16 columns
-        int row = 0;            ///< of the expected cursor
-        int column = 0;         ///< of the expected cursor, 0 to 39
-        bool blinking = false;  ///< of the expected cursor
-        std::string text;       ///< picture's name, words to say, command to run
-    };
-
-    /// Reads a whole journey. Throws std::invalid_argument with "NAME:LINE: what is wrong".
-    Journey(std::istream &input, std::string name);
-
-    [[nodiscard]] const std::vector<Step> &steps() const { return steps_; }
+    [[nodiscard]] const std::vector<Step> &steps() const { return allSteps; }
     /// "NAME:LINE: ", to open a message about the step.
-    [[nodiscard]] std::string place(int line) const;
+    [[nodiscard]] std::string place(const Step &step) const { return place(step.line); }
 
   private:
-    std::string name_;
-    std::vector<Step> steps_;
+    [[nodiscard]] std::string place(int line) const;
+    void add(Step step);
+
+    std::string name;
+    std::vector<Step> allSteps;
+    bool isKeyDown = false; // at the end of the steps so far
 };
 
 } // namespace emulator

@@ -1,7 +1,8 @@
-#include "JourneyPlayer.h"
+#include "emulator/JourneyPlayer.h"
 
 #include <fstream>
 #include <stdexcept>
+#include <utility>
 
 namespace emulator {
 
@@ -9,160 +10,225 @@ namespace {
 
 constexpr std::chrono::seconds runLimit{60};
 
+[[noreturn]] void fail(const std::string &reason) {
+    throw std::runtime_error(reason);
+}
+
+std::string described(const step::ExpectCursor &cursor) {
+    return "row " + std::to_string(cursor.row) + ", column " + std::to_string(cursor.column) +
+           (cursor.blinking ? ", on" : ", off");
+}
+
+step::ExpectCursor cursorOf(const Display &display) {
+    return {display.cursorRow(), display.cursorColumn(), display.cursorBlinking()};
+}
+
 } // namespace
 
-JourneyPlayer::JourneyPlayer(Journey journey, Panel panel, std::ostream &output,
-                             Clock::duration limit, std::optional<std::filesystem::path> pictures)
-    : journey_(std::move(journey)), panel_(panel), output_(output), limit_(limit),
-      pictures_(std::move(pictures)) {}
+JourneyPlayer::JourneyPlayer(Journey itsJourney, Panel itsPanel, Surroundings &itsSurroundings,
+                             std::ostream &itsOutput, Clock::duration firstLimit,
+                             std::optional<std::filesystem::path> picturesFolder)
+    : journey(std::move(itsJourney)), panel(itsPanel), surroundings(itsSurroundings),
+      output(itsOutput), limit(firstLimit), pictures(std::move(picturesFolder)) {}
 
-bool JourneyPlayer::advance(TimePoint now) {
-    while (next_ < journey_.steps().size()) {
-        const Step &step = journey_.steps()[next_];
-        if (!begun_)
-            begin(step, now);
-        begun_ = true;
-        if (!isDone(step, now)) {
-            if (now >= deadline_)
-                fail(step, reasonOfDelay(step));
-            return false;
+bool JourneyPlayer::advance(TimePoint time) {
+    now = time;
+    while (next < journey.steps().size()) {
+        const Step &step = journey.steps()[next];
+        try {
+            if (!hasBegun) {
+                deadline = now + limit;
+                requestsBefore = panel.keypad.requests();
+            }
+            const bool begins = !std::exchange(hasBegun, true);
+            if (!std::visit([&](const auto &action) { return play(action, begins); },
+                            step.action)) {
+                if (now >= deadline)
+                    fail(
+                        std::visit([&](const auto &action) { return delay(action); }, step.action));
+                return false;
+            }
+        } catch (const std::runtime_error &error) {
+            throw std::runtime_error(journey.place(step) + error.what());
         }
-        begun_ = false;
-        next_++;
+        hasBegun = false;
+        next++;
     }
     return true;
 }
 
-void JourneyPlayer::begin(const Step &step, TimePoint now) {
-    deadline_ = now + limit_;
-    answeredBefore_ = answeredLast_ = panel_.keypad.answered();
-    switch (step.action) {
-    case Journey::Action::tap:
-        tapsLeft_ = step.count;
-        panel_.keypad.tap(step.key);
-        break;
-    case Journey::Action::hold:
-        panel_.keypad.press(step.key);
-        break;
-    case Journey::Action::release:
-        panel_.keypad.release();
-        break;
-    case Journey::Action::wait:
-        deadline_ = now + step.time;
-        break;
-    case Journey::Action::picture:
-        takePicture(step);
-        break;
-    case Journey::Action::say:
-        output_ << step.text << '\n' << std::flush;
-        break;
-    case Journey::Action::limit:
-        limit_ = step.time;
-        break;
-    case Journey::Action::run:
-        deadline_ = now + runLimit;
-        output_.flush();
-        shell_ =
-            std::make_unique<ChildProcess>(std::vector<std::string>{"/bin/sh", "-c", step.text});
-        break;
-    case Journey::Action::expect:
-    case Journey::Action::expectCursor:
-        break;
-    }
-}
-
-bool JourneyPlayer::isDone(const Step &step, TimePoint now) {
-    const Display &display = panel_.display;
-    switch (step.action) {
-    case Journey::Action::tap:
-        return isDoneTapping(step, now);
-    case Journey::Action::hold:
-        return isDoneHolding(step, now);
-    case Journey::Action::release:
-        return panel_.keypad.settled();
-    case Journey::Action::wait:
-        return now >= deadline_;
-    case Journey::Action::expect:
-        return display.visibleRow(0) == step.rows[0] && display.visibleRow(1) == step.rows[1];
-    case Journey::Action::expectCursor:
-        return display.cursorRow() == step.row && display.cursorColumn() == step.column &&
-               display.cursorBlinking() == step.blinking;
-    case Journey::Action::run:
-        return isDoneRunning(step);
-    case Journey::Action::picture:
-    case Journey::Action::say:
-    case Journey::Action::limit:
-        break;
-    }
-    return true;
-}
-
-bool JourneyPlayer::isDoneTapping(const Step &step, TimePoint now) {
-    if (!panel_.keypad.settled())
+bool JourneyPlayer::play(const step::Tap &tap, bool begins) {
+    if (begins)
+        tapsLeft = tap.count;
+    else if (!panel.keypad.settled())
         return false;
-    if (--tapsLeft_ == 0)
+    if (tap.until && shows(*tap.until))
         return true;
-    deadline_ = now + limit_;
-    panel_.keypad.tap(step.key);
+    if (tapsLeft == 0 && tap.until)
+        fail("after " + std::to_string(tap.count) +
+             " taps the panel still does not show what is expected\n" +
+             delay(step::Expect{*tap.until}));
+    if (tapsLeft == 0)
+        return true;
+    tapsLeft--;
+    deadline = now + limit;
+    panel.keypad.tap(tap.key);
     return false;
 }
 
-bool JourneyPlayer::isDoneHolding(const Step &step, TimePoint now) {
-    const unsigned long answered = panel_.keypad.answered();
-    if (answered != answeredLast_)
-        deadline_ = now + limit_;
-    answeredLast_ = answered;
-    return answered - answeredBefore_ >= static_cast<unsigned long>(step.count);
+bool JourneyPlayer::play(const step::Keys &sequence, bool begins) {
+    if (begins) {
+        nextStroke = 0;
+    } else {
+        if (!isAnswered(sequence.strokes[nextStroke].polls))
+            return false;
+        panel.keypad.release();
+        if (!panel.keypad.settled())
+            return false;
+        nextStroke++;
+    }
+    if (nextStroke == sequence.strokes.size())
+        return true;
+    const Stroke &stroke = sequence.strokes[nextStroke];
+    awaitAnswers();
+    // A single poll cannot wait for somebody to let go of the key.
+    stroke.polls == 1 ? panel.keypad.tap(stroke.key) : panel.keypad.press(stroke.key);
+    return false;
 }
 
-bool JourneyPlayer::isDoneRunning(const Step &step) {
-    const std::optional<int> status = shell_->status();
-    if (!status)
-        return false;
-    shell_.reset();
-    if (*status != 0)
-        fail(step, "the command ended with status " + std::to_string(*status));
+bool JourneyPlayer::play(const step::Hold &hold, bool begins) {
+    if (begins) {
+        awaitAnswers();
+        panel.keypad.press(hold.key);
+    }
+    return isAnswered(hold.polls);
+}
+
+bool JourneyPlayer::play(const step::Release &, bool begins) {
+    if (begins)
+        panel.keypad.release();
+    return panel.keypad.settled();
+}
+
+bool JourneyPlayer::play(const step::Wait &wait, bool begins) {
+    if (begins)
+        deadline = now + wait.time;
+    return now >= deadline;
+}
+
+bool JourneyPlayer::play(const step::Expect &expect, bool) {
+    return shows(expect.sight);
+}
+
+bool JourneyPlayer::play(const step::ExpectCursor &cursor, bool) {
+    const step::ExpectCursor actual = cursorOf(panel.display);
+    return actual.row == cursor.row && actual.column == cursor.column &&
+           actual.blinking == cursor.blinking;
+}
+
+bool JourneyPlayer::play(const step::TakePicture &picture, bool) {
+    const Picture taken(panel.display);
+    output << taken.text() << std::flush;
+    if (!pictures)
+        return true;
+    const std::filesystem::path path = *pictures / (picture.name + ".svg");
+    std::ofstream file(path, std::ios::binary);
+    file << taken.svg();
+    file.close();
+    if (!file)
+        fail("cannot write " + path.string());
     return true;
 }
 
-void JourneyPlayer::fail(const Step &step, const std::string &reason) const {
-    throw std::runtime_error(journey_.place(step.line) + reason);
+bool JourneyPlayer::play(const step::Say &say, bool) {
+    output << say.text << '\n' << std::flush;
+    return true;
 }
 
-std::string JourneyPlayer::reasonOfDelay(const Step &step) const {
-    const std::string shown = "shown:\n" + Picture(panel_.display).text();
-    const auto cursor = [](int row, int column, bool blinking) {
-        return "row " + std::to_string(row) + ", column " + std::to_string(column) +
-               (blinking ? ", on" : ", off");
-    };
-    switch (step.action) {
-    case Journey::Action::expect:
-        return "the panel does not show what is expected\nwanted:\n" + Picture(step.rows).text() +
-               shown;
-    case Journey::Action::expectCursor:
-        return "the cursor is not where it is expected\nwanted: " +
-               cursor(step.row, step.column, step.blinking) + "\nis at:  " +
-               cursor(panel_.display.cursorRow(), panel_.display.cursorColumn(),
-                      panel_.display.cursorBlinking()) +
-               "\n" + shown;
-    case Journey::Action::run:
-        return "the command is still running after 60 s";
-    default:
-        return "the program does not poll for keys\n" + shown;
+bool JourneyPlayer::play(const step::Limit &newLimit, bool) {
+    limit = newLimit.time;
+    return true;
+}
+
+bool JourneyPlayer::play(const step::Run &run, bool begins) {
+    if (begins) {
+        deadline = now + runLimit;
+        output.flush();
+        surroundings.start(run);
     }
+    return hasSucceeded();
 }
 
-void JourneyPlayer::takePicture(const Step &step) {
-    const Picture picture(panel_.display);
-    output_ << picture.text() << std::flush;
-    if (!pictures_)
-        return;
-    const std::filesystem::path path = *pictures_ / (step.text + ".svg");
-    std::ofstream file(path, std::ios::binary);
-    file << picture.svg();
-    file.close();
-    if (!file)
-        fail(step, "cannot write " + path.string());
+bool JourneyPlayer::play(const step::Appliance &appliance, bool begins) {
+    if (begins) {
+        deadline = now + runLimit;
+        output.flush();
+        surroundings.start(appliance);
+    }
+    return hasSucceeded();
+}
+
+bool JourneyPlayer::play(const TestAction &action, bool) {
+    const std::string fault = surroundings.act(action);
+    if (!fault.empty())
+        fail(fault);
+    return true;
+}
+
+std::string JourneyPlayer::delay(const step::Expect &expect) const {
+    const Sight &sight = expect.sight;
+    return "the panel does not show what is expected\nwanted:\n" +
+           Picture({sight.row0, sight.row1.value_or("(any)")}).text() + shown();
+}
+
+std::string JourneyPlayer::delay(const step::ExpectCursor &cursor) const {
+    return "the cursor is not where it is expected\nwanted: " + described(cursor) +
+           "\nis at:  " + described(cursorOf(panel.display)) + "\n" + shown();
+}
+
+std::string JourneyPlayer::delay(const step::Run &) const {
+    return "the command is still running after 60 s";
+}
+
+std::string JourneyPlayer::delay(const step::Appliance &) const {
+    return "the appliance is still busy with it after 60 s";
+}
+
+void JourneyPlayer::awaitAnswers() {
+    deadline = now + limit;
+    answersBefore = answersLast = panel.keypad.answered();
+}
+
+bool JourneyPlayer::isAnswered(int polls) {
+    const unsigned long answers = panel.keypad.answered();
+    if (answers != answersLast)
+        deadline = now + limit;
+    answersLast = answers;
+    return answers - answersBefore >= static_cast<unsigned long>(polls);
+}
+
+bool JourneyPlayer::hasSucceeded() {
+    const std::optional<int> status = surroundings.status();
+    if (status && *status != 0)
+        fail("it ended with status " + std::to_string(*status));
+    return status.has_value();
+}
+
+bool JourneyPlayer::shows(const Sight &sight) const {
+    const Display &display = panel.display;
+    return display.visibleRow(0) == sight.row0 &&
+           (!sight.row1 || display.visibleRow(1) == *sight.row1);
+}
+
+std::string JourneyPlayer::shown() const {
+    return "shown:\n" + Picture(panel.display).text();
+}
+
+std::string JourneyPlayer::unansweredKey() const {
+    const bool isAsked = panel.keypad.requests() != requestsBefore;
+    return (isAsked ? "the program asks for keys, but does not read the answers\n"
+                    : "the program does not ask for keys\n") +
+           shown();
 }
 
 } // namespace emulator

@@ -1,19 +1,19 @@
 #pragma once
 
-#include "ChildProcess.h"
-#include "Clock.h"
-#include "Display.h"
-#include "Journey.h"
-#include "Keypad.h"
+#include "emulator/Clock.h"
+#include "emulator/Display.h"
+#include "emulator/Journey.h"
+#include "emulator/Keypad.h"
+#include "emulator/Surroundings.h"
 
 #include <filesystem>
-#include <memory>
 #include <optional>
 #include <ostream>
 
 namespace emulator {
 
-/// Plays a journey on a display and a keypad, one step after the other.
+/// Plays a journey on a display and a keypad, one step after the other. It has no clock of its own:
+/// time is what `advance` is told, in the real world as in a test.
 class JourneyPlayer {
   public:
     struct Panel {
@@ -24,41 +24,66 @@ class JourneyPlayer {
     /// Pictures and words go to `output` as text. `limit` is how long an expectation waits, and
     /// how long the program may leave a key unread; pictures are also written as SVG files to
     /// `pictures` if that names a directory.
-    JourneyPlayer(Journey journey, Panel panel, std::ostream &output, Clock::duration limit,
+    JourneyPlayer(Journey journey, Panel panel, Surroundings &surroundings, std::ostream &output,
+                  Clock::duration limit,
                   std::optional<std::filesystem::path> pictures = std::nullopt);
 
     /// Goes as far as the panel's state lets it; to be called whenever that has changed, whenever
-    /// `descriptor` is readable, and at `wakeAt`. Returns true when the journey is over. Throws
-    /// std::runtime_error with the message for the operator when a step fails.
-    bool advance(TimePoint now);
-    [[nodiscard]] TimePoint wakeAt() const { return deadline_; }
-    [[nodiscard]] int descriptor() const { return shell_ ? shell_->descriptor() : -1; }
+    /// what the surroundings started has ended, and at `wakeAt`. Returns true when the journey is
+    /// over. Throws std::runtime_error with the message for the operator when a step fails.
+    bool advance(TimePoint time);
+    [[nodiscard]] TimePoint wakeAt() const { return deadline; }
+    /// Time has passed in which nobody could act, as while the emulator was stopped.
+    void excuse(Clock::duration time) { deadline += time; }
 
   private:
-    using Step = Journey::Step;
+    // Each begins its step when `begins` is true, and says whether the step is over.
+    bool play(const step::Tap &tap, bool begins);
+    bool play(const step::Keys &sequence, bool begins);
+    bool play(const step::Hold &hold, bool begins);
+    bool play(const step::Release &release, bool begins);
+    bool play(const step::Wait &wait, bool begins);
+    bool play(const step::Expect &expect, bool begins);
+    bool play(const step::ExpectCursor &cursor, bool begins);
+    bool play(const step::TakePicture &picture, bool begins);
+    bool play(const step::Say &say, bool begins);
+    bool play(const step::Limit &newLimit, bool begins);
+    bool play(const step::Run &run, bool begins);
+    bool play(const step::Appliance &appliance, bool begins);
+    bool play(const TestAction &action, bool begins);
 
-    void begin(const Step &step, TimePoint now);
-    bool isDone(const Step &step, TimePoint now);
-    bool isDoneTapping(const Step &step, TimePoint now);
-    bool isDoneHolding(const Step &step, TimePoint now);
-    bool isDoneRunning(const Step &step);
-    [[noreturn]] void fail(const Step &step, const std::string &reason) const;
-    [[nodiscard]] std::string reasonOfDelay(const Step &step) const;
-    void takePicture(const Step &step);
+    // Why a step has not come to its end in time.
+    [[nodiscard]] std::string delay(const step::Expect &expect) const;
+    [[nodiscard]] std::string delay(const step::ExpectCursor &cursor) const;
+    [[nodiscard]] std::string delay(const step::Run &run) const;
+    [[nodiscard]] std::string delay(const step::Appliance &appliance) const;
+    template <typename AnyOther> [[nodiscard]] std::string delay(const AnyOther &) const {
+        return unansweredKey();
+    }
 
-    Journey journey_;
-    Panel panel_;
-    std::ostream &output_;
-    Clock::duration limit_;
-    std::optional<std::filesystem::path> pictures_;
+    void awaitAnswers();
+    bool isAnswered(int polls);
+    bool hasSucceeded();
+    [[nodiscard]] bool shows(const Sight &sight) const;
+    [[nodiscard]] std::string shown() const;
+    [[nodiscard]] std::string unansweredKey() const;
 
-    std::size_t next_ = 0;
-    bool begun_ = false;
-    TimePoint deadline_; // of the step that has begun
-    int tapsLeft_ = 0;
-    unsigned long answeredBefore_ = 0;
-    unsigned long answeredLast_ = 0;
-    std::unique_ptr<ChildProcess> shell_;
+    Journey journey;
+    Panel panel;
+    Surroundings &surroundings;
+    std::ostream &output;
+    Clock::duration limit;
+    std::optional<std::filesystem::path> pictures;
+
+    std::size_t next = 0; // step
+    bool hasBegun = false;
+    TimePoint now;
+    TimePoint deadline; // of the step that has begun
+    int tapsLeft = 0;
+    std::size_t nextStroke = 0;
+    unsigned long answersBefore = 0;  // answers to key requests, when the key went down
+    unsigned long answersLast = 0;    // and when they were last looked at
+    unsigned long requestsBefore = 0; // key requests when the step began
 };
 
 } // namespace emulator

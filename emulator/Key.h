@@ -10,14 +10,15 @@ enum class Key { up, down, enter, escape };
 struct KeyTraits {
     Key key;
     std::string_view name; ///< as written in a journey
+    char letter;           ///< in the short form, and on a terminal that cannot tell Shift
     unsigned char code;    ///< second byte of the panel's answer: one bit low for each key
 };
 
 inline constexpr std::array<KeyTraits, 4> keys{{
-    {Key::up, "up", 0xBE},
-    {Key::down, "down", 0xBD},
-    {Key::enter, "enter", 0xBB},
-    {Key::escape, "escape", 0xB7},
+    {Key::up, "up", 'u', 0xBE},
+    {Key::down, "down", 'd', 0xBD},
+    {Key::enter, "enter", 'e', 0xBB},
+    {Key::escape, "escape", 'x', 0xB7},
 }};
 
 constexpr const KeyTraits &traits(Key key) {

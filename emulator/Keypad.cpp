@@ -1,40 +1,41 @@
-#include "Keypad.h"
+#include "emulator/Keypad.h"
 
 namespace emulator {
 
 void Keypad::press(Key key) {
-    down_ = key;
-    tapping_ = false;
+    keyDown = key;
+    isTapping = false;
     answer();
 }
 
 void Keypad::release() {
-    down_.reset();
+    keyDown.reset();
 }
 
 void Keypad::tap(Key key) {
-    down_ = key;
-    tapping_ = true;
+    keyDown = key;
+    isTapping = true;
     answer();
 }
 
 void Keypad::request(bool sinceAnswerRead) {
-    waiting_ = true;
-    if (!down_ && sinceAnswerRead)
-        quietRequests_++;
+    requestCount++;
+    isWaiting = true;
+    if (!keyDown && sinceAnswerRead)
+        quietRequests++;
     answer();
 }
 
 void Keypad::answer() {
-    if (!waiting_ || !down_)
+    if (!isWaiting || !keyDown)
         return;
-    const Key key = *down_;
-    waiting_ = false;
-    quietRequests_ = 0;
-    answered_++;
-    if (tapping_)
-        down_.reset();
-    send_(key);
+    lastKey = *keyDown;
+    isWaiting = false;
+    quietRequests = 0;
+    answerCount++;
+    if (isTapping)
+        keyDown.reset();
+    send(lastKey);
 }
 
 } // namespace emulator

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Key.h"
+#include "emulator/Key.h"
 
 #include <functional>
 #include <optional>
@@ -10,13 +10,14 @@ namespace emulator {
 /// The panel's four keys, of which one is down at a time, and its answers to key requests.
 ///
 /// A request is answered while a key is down. Without one it waits for a key to go down; the next
-/// request takes its place. The panel never answers that no key is down.
+/// request takes its place. The panel never answers that no key is down, and it forgets a key that
+/// came up before it was asked for.
 class Keypad {
   public:
     using Send = std::function<void(Key)>;
 
     /// `send` is called with the key for each answer.
-    explicit Keypad(Send send) : send_(std::move(send)) {}
+    explicit Keypad(Send toSend) : send(std::move(toSend)) {}
 
     /// Puts a key down until `release`. A key that was down comes up.
     void press(Key key);
@@ -29,12 +30,15 @@ class Keypad {
     /// answer is read by its next poll, whose request was on the line already.
     void request(bool sinceAnswerRead);
 
-    [[nodiscard]] std::optional<Key> down() const { return down_; }
-    /// Requests answered so far.
-    [[nodiscard]] unsigned long answered() const { return answered_; }
+    [[nodiscard]] std::optional<Key> down() const { return keyDown; }
+    /// Requests received so far, and those of them that were answered.
+    [[nodiscard]] unsigned long requests() const { return requestCount; }
+    [[nodiscard]] unsigned long answered() const { return answerCount; }
+    /// The key that was answered last; up before the first answer.
+    [[nodiscard]] Key lastAnswer() const { return lastKey; }
     /// True when no key is down and, since the last answer was read, a whole poll has gone by
     /// without one: only then does the program take the next answer for a new press.
-    [[nodiscard]] bool settled() const { return !down_ && quietRequests_ >= wholePoll; }
+    [[nodiscard]] bool settled() const { return !keyDown && quietRequests >= wholePoll; }
 
   private:
     // A poll without a key is known to be over when the request of the next one comes.
@@ -42,12 +46,14 @@ class Keypad {
 
     void answer();
 
-    Send send_;
-    std::optional<Key> down_;
-    bool tapping_ = false;
-    bool waiting_ = false;
-    unsigned long answered_ = 0;
-    unsigned long quietRequests_ = wholePoll;
+    Send send;
+    std::optional<Key> keyDown;
+    Key lastKey = Key::up;
+    bool isTapping = false;
+    bool isWaiting = false; // a request is
+    unsigned long requestCount = 0;
+    unsigned long answerCount = 0;
+    unsigned long quietRequests = wholePoll;
 };
 
 } // namespace emulator

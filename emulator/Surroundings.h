@@ -1,0 +1,31 @@
+#pragma once
+
+#include "emulator/Clock.h"
+#include "emulator/Steps.h"
+
+#include <optional>
+#include <string>
+
+namespace emulator {
+
+/// What a journey reaches beside the panel: a shell, the appliance, and in a test the program.
+class Surroundings {
+  public:
+    Surroundings() = default;
+    Surroundings(const Surroundings &) = delete;
+    Surroundings &operator=(const Surroundings &) = delete;
+    virtual ~Surroundings() = default;
+
+    /// Starts a command for the shell; throws when none can be started.
+    virtual void start(const step::Run &run) = 0;
+    /// Starts a change or a look-up at the appliance; throws when none can be started.
+    virtual void start(const step::Appliance &appliance) = 0;
+    /// The exit status of what was started last, 128 + signal if a signal ended it; nothing while
+    /// it is still at work.
+    virtual std::optional<int> status() = 0;
+
+    /// Does what only a test can. Returns what is wrong, or "" when all is well.
+    virtual std::string act(const TestAction &action) = 0;
+};
+
+} // namespace emulator
