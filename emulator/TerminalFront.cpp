@@ -1,34 +1,31 @@
-#include "TerminalFront.h"
+#include "emulator/TerminalFront.h"
 
-#include "Font.h"
+#include "emulator/Font.h"
 
 // As functions only: the macros of the same names would replace words like `clear` and `move`.
 #define NCURSES_NOMACROS
 #include <curses.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <clocale>
 #include <cstdio>
 #include <string>
+#include <sys/ioctl.h>
+#include <unistd.h>
 
 namespace emulator {
 
 namespace {
 
-constexpr int escapeDelay = 25; // ms until a lone ESC is the key and no sequence's start
 constexpr std::chrono::milliseconds frameTime{100};
 constexpr std::chrono::milliseconds blinkTime{400};
 constexpr std::chrono::milliseconds leastLit{200}; // a tap may well be answered at once
 constexpr std::chrono::seconds rateTime{1};
-constexpr std::size_t mostTaps = 4;
 constexpr std::size_t recentBytes = 12;
 constexpr double lineBytesPerSecond = 2400.0 / 11;
 
 constexpr short glassColours = 1;
-
-// Codes for keys that ncurses has no name for.
-constexpr int shiftEnter = KEY_MAX + 1;
-constexpr int shiftEscape = KEY_MAX + 2;
 
 struct Cell {
     int y, x;
@@ -41,6 +38,9 @@ constexpr Cell glassSize{Display::rowCount + 2, Display::visibleColumns + 2};
 constexpr int lineAt = 7;
 constexpr int countsAt = 8;
 constexpr int helpAt = 10;
+
+constexpr const char *mouseOn = "\033[?1000h\033[?1006h";
+constexpr const char *mouseOff = "\033[?1006l\033[?1000l";
 
 struct DrawnKey {
     Cell at;
@@ -74,56 +74,118 @@ void frame(Cell at, Cell size) {
     delwin(window);
 }
 
+void send(const char *sequence) {
+    std::fputs(sequence, stdout);
+    std::fflush(stdout);
+}
+
 } // namespace
 
-TerminalFront::TerminalFront(const Display &display, Keypad &keypad)
-    : display_(display), keypad_(keypad), countedSince_(Clock::now()) {
+TerminalFront::TerminalFront(Loop &loop, const Display &itsDisplay, Keypad &itsKeypad, Use itsUse)
+    : display(itsDisplay), keypad(itsKeypad), use(itsUse),
+      input(loop, STDIN_FILENO, [this] { readInput(); }), finger(itsKeypad),
+      countedSince(Clock::now()) {
     std::setlocale(LC_ALL, "");
     initscr();
     cbreak();
     noecho();
     nonl();
-    nodelay(stdscr, TRUE);
-    ::keypad(stdscr, TRUE);
-    set_escdelay(escapeDelay);
     curs_set(0);
-    mousemask(BUTTON1_PRESSED | BUTTON1_RELEASED, nullptr);
-    mouseinterval(0);
     if (has_colors()) {
         start_color();
         use_default_colors();
         init_pair(glassColours, COLOR_BLACK, COLOR_GREEN);
     }
-    // The two ways in which terminals tell these keys' Shift, where they do.
-    define_key("\033[13;2u", shiftEnter);
-    define_key("\033[27;2;13~", shiftEnter);
-    define_key("\033[27;2u", shiftEscape);
-    define_key("\033[27;2;27~", shiftEscape);
+    if (use == Use::operate)
+        send(mouseOn);
 }
 
 TerminalFront::~TerminalFront() {
+    if (use == Use::operate)
+        send(mouseOff);
     endwin();
 }
 
-bool TerminalFront::handleInput(TimePoint now) {
-    for (int code = getch(); code != ERR; code = getch()) {
-        if (code == 'q')
-            return false;
-        handleCode(code);
-    }
-    if (!taps_.empty() && keypad_.settled()) {
-        litUntil_.at(index(taps_.front())) = now + leastLit;
-        keypad_.tap(taps_.front());
-        taps_.pop_front();
-    }
-    return true;
+std::optional<int> TerminalFront::look(TimePoint now) {
+    act(decoder.look(now), now);
+    finger.look(now);
+    if (const std::optional<Key> down = keypad.down())
+        litUntil.at(index(*down)) = now + leastLit;
+    if (now >= drawAgain)
+        draw(now);
+    return isOver ? std::optional<int>(EXIT_SUCCESS) : std::nullopt;
 }
 
-void TerminalFront::count(unsigned char byte) {
-    recent_.push_back(byte);
-    if (recent_.size() > recentBytes)
-        recent_.pop_front();
-    counted_++;
+std::optional<TimePoint> TerminalFront::wakeAt() const {
+    TimePoint wake = drawAgain;
+    for (const std::optional<TimePoint> other : {decoder.wakeAt(), finger.wakeAt()})
+        wake = std::min(wake, other.value_or(TimePoint::max()));
+    return wake;
+}
+
+void TerminalFront::resize() {
+    winsize size{};
+    if (ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_row > 0 && size.ws_col > 0)
+        resizeterm(size.ws_row, size.ws_col);
+    drawAgain = {};
+}
+
+void TerminalFront::readInput() {
+    std::array<char, 256> bytes{};
+    const ssize_t count = read(STDIN_FILENO, bytes.data(), bytes.size());
+    if (count < 0 && (errno == EINTR || errno == EAGAIN))
+        return;
+    // A terminal that has gone away reads as its end, or fails.
+    if (count <= 0) {
+        input.pause(true);
+        isOver = true;
+        return;
+    }
+    const TimePoint now = Clock::now();
+    act(decoder.take({bytes.data(), static_cast<std::size_t>(count)}, now), now);
+    drawAgain = {};
+}
+
+void TerminalFront::act(const std::vector<TerminalKeys::Event> &events, TimePoint now) {
+    for (const TerminalKeys::Event &event : events) {
+        if (use == Use::operate || std::holds_alternative<TerminalKeys::Quit>(event))
+            std::visit([&](const auto &what) { act(what, now); }, event);
+    }
+}
+
+void TerminalFront::act(const TerminalKeys::Tap &tap, TimePoint now) {
+    finger.tap(tap.key, now);
+}
+
+void TerminalFront::act(const TerminalKeys::Hold &hold, TimePoint) {
+    finger.hold(hold.key);
+}
+
+void TerminalFront::act(const TerminalKeys::MouseDown &mouse, TimePoint now) {
+    for (const KeyTraits &key : keys) {
+        const Cell at = drawnKeys.at(index(key.key)).at;
+        if (mouse.row == at.y && mouse.column >= at.x && mouse.column < at.x + keyWidth)
+            finger.press(key.key, now);
+    }
+}
+
+void TerminalFront::act(const TerminalKeys::MouseUp &, TimePoint now) {
+    finger.release(now);
+}
+
+void TerminalFront::act(const TerminalKeys::Quit &, TimePoint) {
+    isOver = true;
+}
+
+void TerminalFront::act(const TerminalKeys::Other &, TimePoint) {
+    finger.letGo();
+}
+
+void TerminalFront::carried(unsigned char byte) {
+    recent.push_back(byte);
+    if (recent.size() > recentBytes)
+        recent.pop_front();
+    counted++;
 }
 
 void TerminalFront::draw(TimePoint now) {
@@ -134,131 +196,56 @@ void TerminalFront::draw(TimePoint now) {
     drawGlass(now);
     drawKeys(now);
     drawLine(now);
-    put({helpAt, panelAt.x}, "arrows, Enter, Escape: tap   with Shift, or u d e x: hold   q: quit");
+    put({helpAt, panelAt.x},
+        use == Use::operate ? "arrows, Enter, Escape: tap   with Shift, or u d e x: hold   q: quit"
+                            : "a journey is being played   q: quit");
     refresh();
-    drawAgain_ = now + frameTime;
-}
-
-void TerminalFront::handleCode(int code) {
-    switch (code) {
-    case KEY_UP:
-        return tap(Key::up);
-    case KEY_DOWN:
-        return tap(Key::down);
-    case '\r':
-    case '\n':
-    case KEY_ENTER:
-        return tap(Key::enter);
-    case '\033':
-        return tap(Key::escape);
-    case KEY_SR:
-    case 'u':
-        return hold(Key::up);
-    case KEY_SF:
-    case 'd':
-        return hold(Key::down);
-    case shiftEnter:
-    case 'e':
-        return hold(Key::enter);
-    case shiftEscape:
-    case 'x':
-        return hold(Key::escape);
-    case KEY_MOUSE:
-        return handleMouse();
-    case KEY_RESIZE:
-        return;
-    default:
-        letGo(std::nullopt);
-    }
-}
-
-void TerminalFront::handleMouse() {
-    MEVENT event{};
-    if (getmouse(&event) != OK)
-        return;
-    if (clicked_) {
-        clicked_ = false;
-        keypad_.release();
-    }
-    if ((event.bstate & BUTTON1_PRESSED) == 0)
-        return;
-    for (const KeyTraits &key : keys) {
-        const Cell at = drawnKeys.at(index(key.key)).at;
-        if (event.y != at.y || event.x < at.x || event.x >= at.x + keyWidth)
-            continue;
-        letGo(key.key);
-        taps_.clear();
-        keypad_.press(key.key);
-        clicked_ = true;
-    }
-}
-
-void TerminalFront::tap(Key key) {
-    if (!letGo(key) && taps_.size() < mostTaps)
-        taps_.push_back(key);
-}
-
-void TerminalFront::hold(Key key) {
-    if (letGo(key))
-        return;
-    taps_.clear();
-    held_ = key;
-    keypad_.press(key);
-}
-
-// Any key ends a hold; true if it was the held key itself, which then has no further effect.
-bool TerminalFront::letGo(std::optional<Key> pressed) {
-    if (!held_)
-        return false;
-    const bool same = held_ == pressed;
-    held_.reset();
-    keypad_.release();
-    return same;
+    drawAgain = now + frameTime;
 }
 
 void TerminalFront::drawGlass(TimePoint now) const {
     const attr_t colours = has_colors() ? static_cast<attr_t>(COLOR_PAIR(glassColours)) : A_NORMAL;
     for (int row = 0; row < Display::rowCount; row++) {
-        std::string text = display_.visibleRow(row);
+        std::string text = display.visibleRow(row);
         std::replace_if(
             text.begin(), text.end(), [](char c) { return !isPrintable(c); }, '?');
         put({glassAt.y + 1 + row, glassAt.x + 1}, text, colours);
     }
     const bool on = now.time_since_epoch() / blinkTime % 2 == 0;
-    const int column = display_.cursorColumn();
-    if (display_.cursorBlinking() && on && column < Display::visibleColumns)
-        put({glassAt.y + 1 + display_.cursorRow(), glassAt.x + 1 + column}, " ",
+    const int column = display.cursorColumn();
+    if (display.cursorBlinking() && on && column < Display::visibleColumns)
+        put({glassAt.y + 1 + display.cursorRow(), glassAt.x + 1 + column}, " ",
             colours | A_REVERSE);
 }
 
 void TerminalFront::drawKeys(TimePoint now) {
     for (const KeyTraits &key : keys) {
-        const bool lit = keypad_.down() == key.key || now < litUntil_.at(index(key.key));
+        const bool lit = keypad.down() == key.key || now < litUntil.at(index(key.key));
         const DrawnKey &drawn = drawnKeys.at(index(key.key));
         put(drawn.at, drawn.label, lit ? A_REVERSE | A_BOLD : A_NORMAL);
     }
 }
 
 void TerminalFront::drawLine(TimePoint now) {
-    const std::chrono::duration<double> time = now - countedSince_;
+    const std::chrono::duration<double> time = now - countedSince;
     if (time >= rateTime) {
-        bytesPerSecond_ = static_cast<double>(counted_) / time.count();
-        counted_ = 0;
-        countedSince_ = now;
+        bytesPerSecond = static_cast<double>(counted) / time.count();
+        counted = 0;
+        countedSince = now;
     }
     std::array<char, 64> rate{};
     std::string bytes;
-    for (const unsigned char byte : recent_) {
+    for (const unsigned char byte : recent) {
         std::snprintf(rate.data(), rate.size(), "%02X ", static_cast<unsigned>(byte));
         bytes += rate.data();
     }
     bytes.resize(3 * recentBytes, ' ');
-    std::snprintf(rate.data(), rate.size(), "%4.0f bytes/s %4.0f %% of the line", bytesPerSecond_,
-                  100 * bytesPerSecond_ / lineBytesPerSecond);
+    std::snprintf(rate.data(), rate.size(), "%4.0f bytes/s %4.0f %% of the line", bytesPerSecond,
+                  100 * bytesPerSecond / lineBytesPerSecond);
     put({lineAt, panelAt.x}, bytes + rate.data());
-    put({countsAt, panelAt.x}, "unknown commands: " + std::to_string(display_.unknownCommands()) +
-                                   ", characters past the visible columns: " +
-                                   std::to_string(display_.hiddenCharacters()));
+    put({countsAt, panelAt.x},
+        "unknown commands: " + std::to_string(display.unknownCommands()) +
+            ", characters past the visible columns: " + std::to_string(display.hiddenCharacters()));
 }
 
 } // namespace emulator

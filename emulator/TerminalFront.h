@@ -1,13 +1,15 @@
 #pragma once
 
-#include "Clock.h"
-#include "Display.h"
-#include "Keypad.h"
-#include "TerminalRescue.h"
+#include "emulator/Display.h"
+#include "emulator/Finger.h"
+#include "emulator/Keypad.h"
+#include "emulator/Loop.h"
+#include "emulator/Operator.h"
+#include "emulator/TerminalKeys.h"
+#include "emulator/TerminalRescue.h"
 
 #include <array>
 #include <deque>
-#include <optional>
 
 namespace emulator {
 
@@ -15,44 +17,55 @@ namespace emulator {
 ///
 /// One at a time, because the terminal has one screen. The terminal gets back what it had when
 /// this object is destroyed, and also when the program crashes.
-class TerminalFront {
+class TerminalFront : public Operator {
   public:
-    /// Takes over the terminal; throws std::runtime_error if its kind is not known.
-    TerminalFront(const Display &display, Keypad &keypad);
+    enum class Use {
+        operate, ///< the keyboard and the mouse are the keypad
+        watch,   ///< somebody else presses the keys; only q is taken
+    };
+
+    /// Takes over the terminal; throws std::runtime_error if the panel cannot be drawn on it.
+    TerminalFront(Loop &loop, const Display &display, Keypad &keypad, Use use);
     TerminalFront(const TerminalFront &) = delete;
     TerminalFront &operator=(const TerminalFront &) = delete;
-    ~TerminalFront();
+    ~TerminalFront() override;
 
-    /// Takes in what the operator typed or clicked. Returns false when the operator quits.
-    bool handleInput(TimePoint now);
-    /// Notes a byte that the line has carried.
-    void count(unsigned char byte);
-    void draw(TimePoint now);
-    /// When to draw again even if nothing happens.
-    [[nodiscard]] TimePoint wakeAt() const { return drawAgain_; }
+    /// Ends with status 0 when the operator quits or the terminal goes away.
+    std::optional<int> look(TimePoint now) override;
+    [[nodiscard]] std::optional<TimePoint> wakeAt() const override;
+    void carried(unsigned char byte) override;
+
+    /// Draws for the terminal's size as it is now.
+    void resize();
 
   private:
-    void handleCode(int code);
-    void handleMouse();
-    void tap(Key key);
-    void hold(Key key);
-    bool letGo(std::optional<Key> pressed);
+    void readInput();
+    void act(const std::vector<TerminalKeys::Event> &events, TimePoint now);
+    void act(const TerminalKeys::Tap &tap, TimePoint now);
+    void act(const TerminalKeys::Hold &hold, TimePoint now);
+    void act(const TerminalKeys::MouseDown &mouse, TimePoint now);
+    void act(const TerminalKeys::MouseUp &mouse, TimePoint now);
+    void act(const TerminalKeys::Quit &quit, TimePoint now);
+    void act(const TerminalKeys::Other &other, TimePoint now);
+    void draw(TimePoint now);
     void drawGlass(TimePoint now) const;
     void drawKeys(TimePoint now);
     void drawLine(TimePoint now);
 
-    TerminalRescue rescue_;
-    const Display &display_;
-    Keypad &keypad_;
-    std::deque<Key> taps_;    // typed, and not yet asked for by the program
-    std::optional<Key> held_; // until another key is pressed
-    bool clicked_ = false;    // a key is down by the mouse
-    std::array<TimePoint, keys.size()> litUntil_{};
-    std::deque<unsigned char> recent_;
-    unsigned long counted_ = 0; // bytes since `countedSince_`
-    TimePoint countedSince_;
-    double bytesPerSecond_ = 0;
-    TimePoint drawAgain_;
+    TerminalRescue rescue;
+    const Display &display;
+    Keypad &keypad;
+    Use use;
+    Readable input;
+    TerminalKeys decoder;
+    Finger finger;
+    bool isOver = false;
+    std::array<TimePoint, keys.size()> litUntil{};
+    std::deque<unsigned char> recent;
+    unsigned long counted = 0; // bytes since `countedSince`
+    TimePoint countedSince;
+    double bytesPerSecond = 0;
+    TimePoint drawAgain;
 };
 
 } // namespace emulator

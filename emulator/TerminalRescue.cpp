@@ -1,4 +1,4 @@
-#include "TerminalRescue.h"
+#include "emulator/TerminalRescue.h"
 
 #include <curses.h>
 #include <term.h>
@@ -39,8 +39,7 @@ const char *sequence(const char *name) {
 
 void prepare() {
     state.length = 0;
-    if (sequence("kmous") != nullptr)
-        tputs("\033[?1006l\033[?1000l", 1, keep); // mouse reports off
+    tputs("\033[?1006l\033[?1000l", 1, keep); // mouse reports off
     for (const char *name : {"sgr0", "cnorm", "rmkx", "rmcup"})
         if (const char *value = sequence(name))
             tputs(value, 1, keep);
@@ -64,6 +63,8 @@ TerminalRescue::TerminalRescue() {
     int known = 0;
     if (setupterm(nullptr, STDOUT_FILENO, &known) != OK)
         throw std::runtime_error("this kind of terminal is not known: check TERM");
+    if (sequence("cup") == nullptr)
+        throw std::runtime_error("this kind of terminal cannot place its cursor: check TERM");
     prepare();
     del_curterm(cur_term);
     struct sigaction action {};

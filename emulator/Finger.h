@@ -1,0 +1,56 @@
+#pragma once
+
+#include "emulator/Clock.h"
+#include "emulator/Keypad.h"
+
+#include <deque>
+#include <optional>
+
+namespace emulator {
+
+/// The finger of a person who cannot say for how long: a terminal tells of a key that was typed,
+/// not of one that goes down and comes up. One key is down at a time.
+///
+/// A typed key stays down as long as a finger would, and comes up when it has been answered once.
+/// If the program does not ask meanwhile, the key is forgotten, as on a real panel. Keys that are
+/// typed faster than the program can tell apart wait for their turn, if it asks at all.
+class Finger {
+  public:
+    explicit Finger(Keypad &itsKeypad) : keypad(itsKeypad) {}
+
+    /// A key was typed.
+    void tap(Key key, TimePoint now);
+    /// A key goes down until the same one is held again, or any other is used.
+    void hold(Key key);
+    /// A key goes down until `release`.
+    void press(Key key, TimePoint now);
+    void release(TimePoint now);
+    /// Something was typed that is no key: it ends a hold.
+    void letGo();
+
+    void look(TimePoint now);
+    [[nodiscard]] std::optional<TimePoint> wakeAt() const;
+
+  private:
+    enum class Manner { tap, hold, press };
+    struct Down {
+        Key key;
+        Manner manner;
+        TimePoint since;
+        unsigned long answersBefore;
+    };
+    struct Typed {
+        Key key;
+        TimePoint time;
+        unsigned long requestsBefore;
+    };
+
+    void putDown(Key key, Manner manner, TimePoint now);
+    void lift();
+
+    Keypad &keypad;
+    std::optional<Down> down;
+    std::deque<Typed> waiting;
+};
+
+} // namespace emulator

@@ -1,0 +1,120 @@
+// A person at a terminal: what its bytes mean, and what a finger that types does to the keypad.
+#include "emulator/Finger.h"
+#include "emulator/TerminalKeys.h"
+
+#include <gtest/gtest.h>
+
+using namespace emulator;
+using namespace std::chrono_literals;
+
+namespace {
+
+// The events as letters: the key's initial, in capitals for a hold; M and m for the mouse, Q, and a
+// full stop for any other character.
+std::string letters(const std::vector<TerminalKeys::Event> &events) {
+    struct Letter {
+        char operator()(const TerminalKeys::Tap &tap) const { return traits(tap.key).letter; }
+        char operator()(const TerminalKeys::Hold &hold) const {
+            return static_cast<char>(std::toupper(traits(hold.key).letter));
+        }
+        char operator()(const TerminalKeys::MouseDown &mouse) const {
+            return mouse.row == 1 && mouse.column == 34 ? 'M' : '?';
+        }
+        char operator()(const TerminalKeys::MouseUp &) const { return 'm'; }
+        char operator()(const TerminalKeys::Quit &) const { return 'Q'; }
+        char operator()(const TerminalKeys::Other &) const { return '.'; }
+    };
+    std::string text;
+    for (const auto &event : events)
+        text += std::visit(Letter(), event);
+    return text;
+}
+
+TEST(TerminalKeys, KnowsKeysAndTheMouseAndPassesOverEverythingElse) {
+    const std::vector<std::pair<std::string, std::string>> cases{
+        {"\033[A\033OB\r\n", "udee"},
+        {"udex", "UDEX"},
+        {"\033[1;2A\033[b\033[13;2u\033[27;2;27~", "UDEX"},
+        {"\033[<0;35;2M\033[<0;35;2m", "Mm"},
+        {"q?", "Q."},
+        {"\033[I\033[O\033[200~\033[201~\033[5~\033[<64;1;1M\033q\033[1;5C", ""},
+        {"\033\033[A", "xu"},
+        {"\033[" + std::string(40, '1') + "A", std::string(11, '.')}, // given up after 32 bytes
+    };
+    for (const auto &[bytes, meaning] : cases)
+        EXPECT_EQ(letters(TerminalKeys().take(bytes, {})), meaning) << bytes;
+}
+
+TEST(TerminalKeys, WaitsForTheRestOfASequenceButNotForEver) {
+    TerminalKeys keys;
+    TimePoint now;
+    EXPECT_EQ(letters(keys.take("\033", now)), "");
+    EXPECT_EQ(letters(keys.look(now + 24ms)), "");
+    EXPECT_EQ(letters(keys.look(now + 25ms)), "x");
+    EXPECT_EQ(letters(keys.take("\033", now)), "");
+    EXPECT_EQ(letters(keys.take("[<0;35", now + 20ms)), "");
+    EXPECT_EQ(letters(keys.take(";2M", now + 40ms)), "M");
+    EXPECT_EQ(letters(keys.take("\033[<", now)), "");
+    EXPECT_EQ(letters(keys.take("q", now + 250ms)), "Q");
+    EXPECT_FALSE(keys.wakeAt());
+}
+
+struct Hand {
+    // A poll, 0.1 s after the one before: its answer's letter, or a full stop.
+    char poll() {
+        now += 100ms;
+        keypad.request(true);
+        finger.look(now);
+        return std::exchange(answer, '.');
+    }
+    std::string polls(int count) {
+        std::string answers;
+        while (count-- > 0)
+            answers += poll();
+        return answers;
+    }
+
+    char answer = '.';
+    Keypad keypad{[this](Key key) { answer = traits(key).letter; }};
+    Finger finger{keypad};
+    TimePoint now;
+};
+
+TEST(Finger, TypesEachKeyAsAPressOfItsOwn) {
+    Hand hand;
+    for (const Key key : {Key::down, Key::down, Key::enter})
+        hand.finger.tap(key, hand.now);
+    EXPECT_EQ(hand.polls(9), "d.d.e....");
+}
+
+TEST(Finger, IsForgottenWhenNobodyAsksForItsKeys) {
+    Hand hand;
+    for (int k = 0; k < 3; k++)
+        hand.finger.tap(Key::enter, hand.now);
+    hand.now += 500ms; // as while changes are applied
+    hand.finger.look(hand.now);
+    EXPECT_FALSE(hand.keypad.down());
+    EXPECT_EQ(hand.polls(5), ".....");
+}
+
+TEST(Finger, HoldsUntilAnyOtherKeyAndAClickIsNotLost) {
+    Hand hand;
+    hand.finger.hold(Key::up);
+    EXPECT_EQ(hand.polls(2), "uu");
+    hand.finger.hold(Key::up);
+    EXPECT_EQ(hand.polls(2), "..");
+    hand.finger.hold(Key::up);
+    hand.finger.tap(Key::up, hand.now); // only ends the hold
+    EXPECT_EQ(hand.polls(3), "u..");    // which was asked for already
+    hand.finger.hold(Key::up);
+    hand.finger.press(Key::enter, hand.now);
+    EXPECT_EQ(hand.polls(2), "ee");
+    hand.finger.release(hand.now);
+    hand.finger.tap(Key::down, hand.now);
+    EXPECT_EQ(hand.polls(5), ".d...");
+    hand.finger.press(Key::escape, hand.now);
+    hand.finger.release(hand.now); // before anybody has asked
+    EXPECT_EQ(hand.polls(3), "x..");
+}
+
+} // namespace
