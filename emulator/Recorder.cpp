@@ -1,0 +1,96 @@
+#include "emulator/Recorder.h"
+
+#include "emulator/Font.h"
+#include "emulator/StepTable.h"
+
+#include <algorithm>
+#include <stdexcept>
+
+namespace emulator {
+
+namespace {
+
+std::string withoutBlanksAtEnd(std::string text) {
+    text.erase(text.find_last_not_of(' ') + 1);
+    return text;
+}
+
+// What a journey says of the display; nothing where it cannot, as of a letter that is no ASCII.
+std::string stepsThatExpect(const Display &display) {
+    const std::string row0 = display.visibleRow(0), row1 = display.visibleRow(1);
+    if (!std::all_of(row0.begin(), row0.end(), isPrintable) ||
+        !std::all_of(row1.begin(), row1.end(), isPrintable))
+        return "";
+    std::string steps = "expect " + quoted(withoutBlanksAtEnd(row0)) + " " +
+                        quoted(withoutBlanksAtEnd(row1)) + "\n";
+    if (display.cursorBlinking())
+        steps += "expect-cursor " + std::to_string(display.cursorRow()) + " " +
+                 std::to_string(display.cursorColumn()) + " on\n";
+    return steps;
+}
+
+} // namespace
+
+Recorder::Recorder(std::string itsPath, const Display &itsDisplay, const Keypad &itsKeypad)
+    : display(itsDisplay), keypad(itsKeypad), path(std::move(itsPath)), file(path),
+      answersSeen(keypad.answered()), requestsSeen(keypad.requests()) {
+    // The longest that the program keeps a page is a minute.
+    file << "# Recorded at the panel.\nlimit 90\n" << std::flush;
+    if (!file)
+        throw std::runtime_error("cannot write " + path);
+}
+
+std::optional<int> Recorder::look(TimePoint) {
+    // A key that is answered at its request was pressed while the panel showed what it does now:
+    // the request comes behind everything that the program has drawn before it.
+    const bool isAsked = keypad.requests() != requestsSeen;
+    requestsSeen = keypad.requests();
+    if (isAsked || keypad.answered() != answersSeen)
+        sight = stepsThatExpect(display);
+    countAnswers();
+    if (held && keypad.settled())
+        writeStroke(true);
+    return std::nullopt;
+}
+
+void Recorder::countAnswers() {
+    const unsigned long answers = keypad.answered() - answersSeen;
+    if (answers == 0)
+        return;
+    answersSeen = keypad.answered();
+    const Key key = keypad.lastAnswer();
+    if (held && held->key == key) {
+        held->polls += answers;
+    } else {
+        if (held)
+            writeStroke(false);
+        // While a key is down, the program goes on counting it: nothing can be waited for.
+        if (!isKeyDown)
+            file << sight;
+        held = Held{key, answers};
+    }
+    sight.clear(); // what the key has done is not seen before the next request
+}
+
+void Recorder::writeStroke(bool isReleased) {
+    const std::string name(traits(held->key).name);
+    // A tap's one poll could not be told from those of a key that is still down.
+    if (held->polls == 1 && isReleased && !isKeyDown)
+        file << "tap " << name << "\n";
+    else
+        file << "hold " << name << " " << held->polls << "\n" << (isReleased ? "release\n" : "");
+    file << std::flush;
+    isKeyDown = !isReleased;
+    held.reset();
+}
+
+void Recorder::finish() {
+    if (held)
+        writeStroke(true);
+    file << sight;
+    file.close();
+    if (!file)
+        throw std::runtime_error("cannot write " + path);
+}
+
+} // namespace emulator
