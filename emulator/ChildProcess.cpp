@@ -1,6 +1,4 @@
-#include "ChildProcess.h"
-
-#include "Clock.h"
+#include "emulator/ChildProcess.h"
 
 #include <fcntl.h>
 #include <sys/prctl.h>
@@ -19,6 +17,7 @@ namespace emulator {
 namespace {
 
 constexpr std::chrono::seconds gracePeriod{2};
+constexpr std::chrono::seconds killPeriod{1};
 constexpr timespec endingLook{0, 10'000'000}; // how often to see whether the group is empty
 constexpr int cannotRun = 127;
 
@@ -26,7 +25,7 @@ int shellStatus(int raw) {
     return WIFEXITED(raw) ? WEXITSTATUS(raw) : 128 + WTERMSIG(raw);
 }
 
-// Has this process ended, as if by SIGTERM, when `parent` is.
+// Has this process ended, as if by SIGTERM, when `parent` has.
 void endWith(pid_t parent) {
     prctl(PR_SET_PDEATHSIG, SIGTERM);
     // The parent may have gone before it was asked to tell of its end.
@@ -50,7 +49,8 @@ void endWith(pid_t parent) {
     _exit(cannotRun);
 }
 
-// Waits until the command and its group have ended; SIGTERM makes it end them.
+// Waits until the command and its group have ended; SIGTERM makes it end them, as far as it can:
+// who has become root cannot be killed, and a zombie whose parent has left the group stays.
 int waitForGroup(pid_t command, const sigset_t &awaited) {
     std::optional<int> status;
     std::optional<TimePoint> giveUp;
@@ -71,16 +71,23 @@ int waitForGroup(pid_t command, const sigset_t &awaited) {
         } else if (giveUp && Clock::now() >= *giveUp) {
             kill(-command, SIGKILL);
         }
+        if (giveUp && Clock::now() >= *giveUp + killPeriod)
+            kill(getpid(), SIGKILL); // which is how the emulator can tell
     }
 }
 
-[[noreturn]] void guard(std::vector<std::string> &command, int output, int report, pid_t parent) {
+[[noreturn]] void guardCommand(std::vector<std::string> &command, int output, int report,
+                               pid_t parent) {
     // Nothing but SIGKILL ends the guard before the command. Blocked ahead of anything else so
     // that no request to end the command gets lost.
     sigset_t all;
     sigfillset(&all);
     sigprocmask(SIG_BLOCK, &all, nullptr);
+    // The emulator's handlers would swallow a signal that comes before the command's own start.
+    for (int number = 1; number < NSIG; number++)
+        signal(number, SIG_DFL);
     endWith(parent);
+    setsid(); // a background group of the terminal would be stopped when it reads or writes there
     prctl(PR_SET_CHILD_SUBREAPER, 1); // so that orphans of the group do not linger as zombies
     dup2(open("/dev/null", O_RDONLY | O_CLOEXEC), STDIN_FILENO);
     if (output >= 0) {
@@ -106,36 +113,42 @@ int waitForGroup(pid_t command, const sigset_t &awaited) {
 
 } // namespace
 
-ChildProcess::ChildProcess(std::vector<std::string> command, int output) {
+ChildProcess::ChildProcess(Loop &loop, std::vector<std::string> words, int output) {
     std::array<int, 2> ends{};
     if (pipe2(ends.data(), O_CLOEXEC) != 0)
         throw std::system_error(errno, std::generic_category(), "cannot open a pipe");
-    const FileDescriptor result(ends[0]);
+    const FileDescriptor pidReport(ends[0]);
     FileDescriptor report(ends[1]);
     const pid_t self = getpid();
-    guard_ = fork();
-    if (guard_ == 0)
-        guard(command, output, report.get(), self);
+    guard = fork();
+    if (guard == 0)
+        guardCommand(words, output, report.get(), self);
     report.reset();
-    if (guard_ < 0 || read(result.get(), &command_, sizeof command_) != sizeof command_ ||
-        command_ < 0)
+    if (guard < 0 || read(pidReport.get(), &command, sizeof command) != sizeof command ||
+        command < 0)
         throw std::system_error(errno, std::generic_category(), "cannot start a process");
     // By number: the C library's header for it does not serve C++.
-    end_ = FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, guard_, 0)));
+    guardEnd = FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, guard, 0)));
+    guardEndWait = std::make_unique<Readable>(loop, guardEnd.get(), [this] { status(); });
 }
 
 ChildProcess::~ChildProcess() {
-    if (status())
-        return;
-    kill(guard_, SIGTERM);
-    waitpid(guard_, nullptr, 0);
+    end();
+}
+
+void ChildProcess::end() {
+    if (!status())
+        kill(guard, SIGTERM);
 }
 
 std::optional<int> ChildProcess::status() {
     int raw = 0;
-    if (!status_ && waitpid(guard_, &raw, WNOHANG) == guard_)
-        status_ = shellStatus(raw);
-    return status_;
+    if (!result && waitpid(guard, &raw, WNOHANG) == guard) {
+        result = shellStatus(raw);
+        hasGuardGivenUp = WIFSIGNALED(raw);
+        guardEndWait.reset();
+    }
+    return result;
 }
 
 } // namespace emulator

@@ -1,4 +1,4 @@
-#include "Display.h"
+#include "emulator/Display.h"
 
 namespace emulator {
 
@@ -31,16 +31,16 @@ Display::Display() {
 bool Display::receive(unsigned char byte) {
     if (byte == commandPrefix) {
         // A prefix behind a prefix: the command between them was lost.
-        if (commandFollows_)
-            unknownCommands_++;
-        commandFollows_ = true;
+        if (commandFollows)
+            unknownCount++;
+        commandFollows = true;
         return false;
     }
-    if (!commandFollows_) {
+    if (!commandFollows) {
         write(byte);
         return false;
     }
-    commandFollows_ = false;
+    commandFollows = false;
     return execute(byte);
 }
 
@@ -49,15 +49,15 @@ std::string Display::visibleRow(int row) const {
 }
 
 std::string Display::wholeRow(int row) const {
-    return rows_.at(static_cast<std::size_t>(row));
+    return rows.at(static_cast<std::size_t>(row));
 }
 
 int Display::cursorRow() const {
-    return position_ / columns;
+    return position / columns;
 }
 
 int Display::cursorColumn() const {
-    return position_ % columns;
+    return position % columns;
 }
 
 bool Display::execute(unsigned char command) {
@@ -69,19 +69,19 @@ bool Display::execute(unsigned char command) {
         clear();
         return false;
     case cursorHome:
-        position_ = 0;
+        position = 0;
         return false;
     case cursorOff:
-        blinking_ = false;
+        isBlinking = false;
         return false;
     case cursorBlink:
-        blinking_ = true;
+        isBlinking = true;
         return false;
     case cursorLeft:
-        position_ = (position_ + positions - 1) % positions;
+        position = (position + positions - 1) % positions;
         return false;
     case cursorRight:
-        position_ = (position_ + 1) % positions;
+        position = (position + 1) % positions;
         return false;
     case readKey:
         return true;
@@ -91,11 +91,11 @@ bool Display::execute(unsigned char command) {
     // Address 68 hex lies one past row 1's end. The counter takes it as it takes running past
     // 67 hex, starting over at 00, so that a step to the left from it is row 1's last column.
     if (command >= row1Address && command <= row1Address + columns) {
-        position_ = (columns + command - row1Address) % positions;
+        position = (columns + command - row1Address) % positions;
     } else if (command >= row0Address && command < row0Address + columns) {
-        position_ = command - row0Address;
+        position = command - row0Address;
     } else {
-        unknownCommands_++;
+        unknownCount++;
     }
     return false;
 }
@@ -103,15 +103,15 @@ bool Display::execute(unsigned char command) {
 void Display::write(unsigned char character) {
     const int column = cursorColumn();
     if (column >= visibleColumns)
-        hiddenCharacters_++;
-    rows_.at(static_cast<std::size_t>(cursorRow())).at(static_cast<std::size_t>(column)) =
+        hiddenCount++;
+    rows.at(static_cast<std::size_t>(cursorRow())).at(static_cast<std::size_t>(column)) =
         static_cast<char>(character);
-    position_ = (position_ + 1) % positions;
+    position = (position + 1) % positions;
 }
 
 void Display::clear() {
-    rows_.fill(std::string(columns, ' '));
-    position_ = 0;
+    rows.fill(std::string(columns, ' '));
+    position = 0;
 }
 
 } // namespace emulator

@@ -29,24 +29,24 @@ class Display {
 
     [[nodiscard]] int cursorRow() const;
     [[nodiscard]] int cursorColumn() const;
-    [[nodiscard]] bool cursorBlinking() const { return blinking_; }
+    [[nodiscard]] bool cursorBlinking() const { return isBlinking; }
 
     /// Commands received that this panel does not know; they change nothing else.
-    [[nodiscard]] unsigned long unknownCommands() const { return unknownCommands_; }
+    [[nodiscard]] unsigned long unknownCommands() const { return unknownCount; }
     /// Characters received for positions that the glass does not show.
-    [[nodiscard]] unsigned long hiddenCharacters() const { return hiddenCharacters_; }
+    [[nodiscard]] unsigned long hiddenCharacters() const { return hiddenCount; }
 
   private:
     bool execute(unsigned char command);
     void write(unsigned char character);
     void clear();
 
-    std::array<std::string, rowCount> rows_;
-    int position_ = 0; // 0 to 79: the address counter without the gap between the rows
-    bool commandFollows_ = false;
-    bool blinking_ = false;
-    unsigned long unknownCommands_ = 0;
-    unsigned long hiddenCharacters_ = 0;
+    std::array<std::string, rowCount> rows;
+    int position = 0; // 0 to 79: the address counter without the gap between the rows
+    bool commandFollows = false;
+    bool isBlinking = false;
+    unsigned long unknownCount = 0;
+    unsigned long hiddenCount = 0;
 };
 
 } // namespace emulator

@@ -1,37 +1,25 @@
-#include "Emulator.h"
-
-#include <fcntl.h>
-#include <poll.h>
-#include <sys/signalfd.h>
+#include "emulator/Emulator.h"
 
 #include <algorithm>
-#include <array>
-#include <cerrno>
 #include <csignal>
 #include <cstdlib>
-#include <ctime>
+#include <cstring>
+#include <exception>
 #include <iostream>
 #include <stdexcept>
-#include <system_error>
+#include <utility>
 
 namespace emulator {
 
 namespace {
 
-constexpr std::size_t tailBytes = 4096;
-constexpr int signalStatus = 128;
-
-FileDescriptor openSignals() {
-    sigset_t ends;
-    sigemptyset(&ends);
-    for (const int signal : {SIGHUP, SIGINT, SIGQUIT, SIGTERM})
-        sigaddset(&ends, signal);
-    sigprocmask(SIG_BLOCK, &ends, nullptr);
-    FileDescriptor signals(signalfd(-1, &ends, SFD_NONBLOCK | SFD_CLOEXEC));
-    if (signals.get() < 0)
-        throw std::system_error(errno, std::generic_category(), "cannot wait for signals");
-    return signals;
-}
+constexpr int signalStatus = 128; // and the signal's number
+// The guard needs three at most to end the command, or to give up.
+constexpr std::chrono::seconds commandPatience{4};
+// A turn comes at least that often, and one that comes much later does because the emulator was
+// stopped.
+constexpr std::chrono::milliseconds idleTurn{500};
+constexpr std::chrono::milliseconds longestTurn{1000};
 
 std::vector<std::string> withPath(std::vector<std::string> command, const std::string &path) {
     constexpr std::string_view placeholder = "{tty}";
@@ -45,118 +33,163 @@ std::vector<std::string> withPath(std::vector<std::string> command, const std::s
     return command;
 }
 
-timespec until(TimePoint wake) {
-    const auto left = std::max(wake - Clock::now(), Clock::duration::zero());
-    const auto whole = std::chrono::duration_cast<std::chrono::seconds>(left);
-    return {whole.count(), std::chrono::nanoseconds(left - whole).count()};
+// Names the signals that end programs. Beyond them a status is rather the program's own.
+std::string described(int status) {
+    std::string text = "status " + std::to_string(status);
+    if (status > signalStatus && status <= signalStatus + SIGTERM)
+        text += " (" + std::string(strsignal(status - signalStatus)) + ")";
+    return text;
 }
 
 } // namespace
 
 Emulator::Emulator(const Options &options, std::optional<Journey> journey)
-    : line_(options.fast, options.trace),
-      keypad_([this](Key key) { line_.answer(traits(key).code); }), signals_(openSignals()) {
-    setenv("PANEL_TTY", line_.path().c_str(), 1);
+    : loop([this] { turn(); }), line(options.fast, options.trace),
+      keypad([this](Key key) { line.answer(traits(key).code); }),
+      arrivals(loop, line.descriptor(), [] {}), output(loop), lastTurn(Clock::now()) {
+    loop.onSignals({SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGCONT, SIGWINCH},
+                   [this](int number) { handleSignal(number); });
+    setenv("PANEL_TTY", line.path().c_str(), 1);
     FileDescriptor commandOutput;
-    if (journey) {
-        player_.emplace(std::move(*journey), JourneyPlayer::Panel{display_, keypad_}, std::cout,
-                        options.limit, options.pictures);
-    } else {
-        std::array<int, 2> ends{};
-        if (pipe2(ends.data(), O_CLOEXEC) != 0)
-            throw std::system_error(errno, std::generic_category(), "cannot open a pipe");
-        output_ = FileDescriptor(ends[0]);
-        commandOutput = FileDescriptor(ends[1]);
-        fcntl(output_.get(), F_SETFL, O_NONBLOCK);
-        front_ = std::make_unique<TerminalFront>(display_, keypad_);
+    const bool isDrawn = !journey || options.show;
+    isJourney = journey.has_value();
+    if (isJourney)
+        journeyOperator =
+            add<JourneyOperator>(loop, std::move(*journey), JourneyPlayer::Panel{display, keypad},
+                                 std::cout, options.limit, options.pictures);
+    if (options.record)
+        recorder = add<Recorder>(*options.record, display, keypad);
+    if (isDrawn) {
+        commandOutput = output.open();
+        front = add<TerminalFront>(loop, display, keypad,
+                                   journeyOperator != nullptr ? TerminalFront::Use::watch
+                                                              : TerminalFront::Use::operate);
     }
-    command_ = std::make_unique<ChildProcess>(withPath(options.command, line_.path()),
-                                              commandOutput.get());
-    setenv("PANEL_COMMAND_PID", std::to_string(command_->pid()).c_str(), 1);
+    command = std::make_unique<ChildProcess>(loop, withPath(options.command, line.path()),
+                                             commandOutput.get());
+    setenv("PANEL_COMMAND_PID", std::to_string(command->pid()).c_str(), 1);
+    if (journeyOperator != nullptr)
+        journeyOperator->setCommand(options.command.front(), command->pid());
+}
+
+template <typename Kind, typename... Arguments> Kind *Emulator::add(Arguments &&...arguments) {
+    auto added = std::make_unique<Kind>(std::forward<Arguments>(arguments)...);
+    Kind *borrowed = added.get();
+    operators.push_back(std::move(added));
+    return borrowed;
 }
 
 int Emulator::run() {
-    for (;;) {
-        waitForEvents();
-        if (const std::optional<int> signal = takeSignal())
-            return finish(signalStatus + *signal);
-        line_.collect();
-        drainOutput();
-        const TimePoint now = Clock::now();
-        bool over = advance(now);
-        while (const std::optional<Line::Byte> byte = line_.next(now)) {
-            if (display_.receive(byte->value))
-                keypad_.request(byte->sinceAnswerRead);
-            if (hasTerminal())
-                front_->count(byte->value);
-            // After each byte, so that no state of the panel is missed.
-            over = over || advance(now);
-        }
-        if (over)
-            return finish(EXIT_SUCCESS);
-        if (hasTerminal())
-            front_->draw(now);
-        if (const std::optional<int> status = command_->status()) {
-            if (hasTerminal())
-                return finish(*status);
-            throw std::runtime_error("the command ended with status " + std::to_string(*status) +
-                                     " before the journey did\nshown:\n" +
-                                     Picture(display_).text());
-        }
+    std::exception_ptr failure;
+    try {
+        turn();
+        loop.run();
+    } catch (const std::runtime_error &) {
+        failure = std::current_exception();
+        finish(EXIT_FAILURE);
+        turn();
+        loop.run();
+    }
+    report();
+    if (failure)
+        std::rethrow_exception(failure);
+    return *result;
+}
+
+void Emulator::handleSignal(int number) {
+    if (number == SIGWINCH) {
+        if (front != nullptr)
+            front->resize();
+    } else if (number != SIGCONT) { // which a turn notices by itself: it comes late
+        finish(signalStatus + number);
     }
 }
 
-void Emulator::waitForEvents() {
-    std::array<pollfd, 6> events{{{signals_.get(), POLLIN, 0},
-                                  {command_->descriptor(), POLLIN, 0},
-                                  {line_.descriptor(), POLLIN, 0},
-                                  {output_.get(), POLLIN, 0},
-                                  {hasTerminal() ? STDIN_FILENO : -1, POLLIN, 0},
-                                  {player_ ? player_->descriptor() : -1, POLLIN, 0}}};
-    TimePoint wake = hasTerminal() ? front_->wakeAt() : player_->wakeAt();
-    if (const std::optional<TimePoint> line = line_.wakeAt())
-        wake = std::min(wake, *line);
-    const timespec timeout = until(wake);
-    ppoll(events.data(), events.size(), &timeout, nullptr);
-}
-
-void Emulator::drainOutput() {
-    std::array<char, tailBytes> bytes{};
-    ssize_t count = 0;
-    while (output_.get() >= 0 && (count = read(output_.get(), bytes.data(), bytes.size())) > 0) {
-        outputTail_.append(bytes.data(), static_cast<std::size_t>(count));
-        if (outputTail_.size() > tailBytes)
-            outputTail_.erase(0, outputTail_.size() - tailBytes);
+void Emulator::turn() {
+    const TimePoint begin = Clock::now();
+    if (begin - lastTurn > longestTurn) {
+        for (const auto &each : operators)
+            each->excuse(begin - lastTurn);
     }
-    if (output_.get() >= 0 && count == 0)
-        output_.reset();
-}
-
-bool Emulator::advance(TimePoint now) {
-    return hasTerminal() ? !front_->handleInput(now) : player_->advance(now);
-}
-
-std::optional<int> Emulator::takeSignal() {
-    signalfd_siginfo info{};
-    if (read(signals_.get(), &info, sizeof info) <= 0)
-        return std::nullopt;
-    return static_cast<int>(info.ssi_signo);
-}
-
-int Emulator::finish(int status) {
-    front_.reset();
-    const bool endedByItself = command_->status().has_value();
-    command_.reset();
-    drainOutput();
-    if (endedByItself)
-        std::cerr << outputTail_;
-    if (player_ && display_.unknownCommands() + display_.hiddenCharacters() > 0) {
-        std::cout << "unknown commands: " << display_.unknownCommands()
-                  << ", characters past the visible columns: " << display_.hiddenCharacters()
-                  << '\n'
-                  << std::flush;
+    lastTurn = begin;
+    line.collect();
+    const TimePoint now = Clock::now();
+    letOperatorsLook(now);
+    while (const std::optional<Line::Byte> byte = line.next(now)) {
+        if (display.receive(byte->value))
+            keypad.request(byte->sinceAnswerRead);
+        for (const auto &each : operators)
+            each->carried(byte->value);
+        // After each byte, so that no state of the panel is missed.
+        letOperatorsLook(now);
     }
-    return status;
+    noticeCommandsEnd();
+    loop.wakeAt(nextTurn(now));
+    arrivals.pause(line.descriptor() < 0);
+}
+
+TimePoint Emulator::nextTurn(TimePoint now) const {
+    TimePoint wake = std::min(now + idleTurn, line.wakeAt().value_or(TimePoint::max()));
+    for (const auto &each : operators)
+        wake = std::min(wake, each->wakeAt().value_or(TimePoint::max()));
+    return wake;
+}
+
+void Emulator::letOperatorsLook(TimePoint now) {
+    for (const auto &each : operators) {
+        if (result)
+            return;
+        if (const std::optional<int> status = each->look(now))
+            finish(*status);
+    }
+}
+
+void Emulator::noticeCommandsEnd() {
+    const std::optional<int> status = command->status();
+    if (status && !result) {
+        if (journeyOperator != nullptr)
+            throw std::runtime_error("the command ended with " + described(*status) +
+                                     " before the journey did\nshown:\n" + Picture(display).text());
+        hasCommandEndedItself = true;
+        finish(*status);
+    }
+    if (!result)
+        return;
+    dismissOperators();
+    if (status || Clock::now() >= patience)
+        loop.stop();
+}
+
+void Emulator::finish(int exitStatus) {
+    result = exitStatus;
+    patience = Clock::now() + commandPatience;
+    command->end();
+}
+
+// Gives the terminal back, too, before anything is said there.
+void Emulator::dismissOperators() {
+    front = nullptr;
+    journeyOperator = nullptr;
+    const auto all = std::exchange(operators, {});
+    if (recorder != nullptr)
+        std::exchange(recorder, nullptr)->finish();
+}
+
+void Emulator::report() {
+    const std::optional<int> status = command->status();
+    if (!status || command->isLeftRunning())
+        std::cerr << "panel-emulator: the command cannot be ended: it is left running\n";
+    if (hasCommandEndedItself)
+        std::cerr << output.lastWords() << "panel-emulator: the command ended with "
+                  << described(*status) << "\n";
+    if (isJourney && display.unknownCommands() + display.hiddenCharacters() > 0) {
+        std::cout << "unknown commands: " << display.unknownCommands()
+                  << ", characters past the visible columns: " << display.hiddenCharacters()
+                  << '\n';
+    }
+    line.finishTrace();
+    if (!std::cout.flush())
+        throw std::runtime_error("cannot write to standard output");
 }
 
 } // namespace emulator

@@ -1,47 +1,62 @@
 #pragma once
 
-#include "ChildProcess.h"
-#include "Display.h"
-#include "JourneyPlayer.h"
-#include "Keypad.h"
-#include "Line.h"
-#include "Options.h"
-#include "TerminalFront.h"
+#include "emulator/ChildProcess.h"
+#include "emulator/CommandOutput.h"
+#include "emulator/Display.h"
+#include "emulator/JourneyOperator.h"
+#include "emulator/Keypad.h"
+#include "emulator/Line.h"
+#include "emulator/Loop.h"
+#include "emulator/Options.h"
+#include "emulator/Recorder.h"
+#include "emulator/TerminalFront.h"
 
 #include <memory>
 #include <string>
+#include <vector>
 
 namespace emulator {
 
-/// The emulated panel at work: one loop around the line, the display, the keypad, the command
-/// that uses them, and either a journey or the terminal as the operator.
+/// The emulated panel at work: the line, the display, the keypad, the command that uses them, and
+/// the operators.
 class Emulator {
   public:
     /// Opens the line and starts the command. The journey, if any, has been read by then.
-    /// Throws when the line, the terminal or a process cannot be had.
+    /// Throws when the line, the terminal, a file or a process cannot be had.
     Emulator(const Options &options, std::optional<Journey> journey);
 
-    /// Runs until the journey or the command ends, the operator quits or a signal comes. Returns
-    /// the emulator's exit status. Throws std::runtime_error when the journey fails.
+    /// Runs until the journey or the command ends, the operator quits or a signal comes, and then
+    /// until the command has ended. Returns the emulator's exit status. Throws std::runtime_error
+    /// when the journey fails.
     int run();
 
   private:
-    void waitForEvents();
-    void drainOutput();
-    bool advance(TimePoint now);
-    std::optional<int> takeSignal();
-    int finish(int status);
-    [[nodiscard]] bool hasTerminal() const { return front_ != nullptr; }
+    template <typename Kind, typename... Arguments> Kind *add(Arguments &&...arguments);
+    void handleSignal(int number);
+    void turn();
+    [[nodiscard]] TimePoint nextTurn(TimePoint now) const;
+    void letOperatorsLook(TimePoint now);
+    void noticeCommandsEnd();
+    void finish(int exitStatus);
+    void dismissOperators();
+    void report();
 
-    Display display_;
-    Line line_;
-    Keypad keypad_;
-    FileDescriptor signals_;
-    FileDescriptor output_;  // where a command's output is read on a terminal
-    std::string outputTail_; // the last of it
-    std::optional<JourneyPlayer> player_;
-    std::unique_ptr<TerminalFront> front_;
-    std::unique_ptr<ChildProcess> command_;
+    Loop loop;
+    Display display;
+    Line line;
+    Keypad keypad;
+    Readable arrivals; // on the line
+    CommandOutput output;
+    std::vector<std::unique_ptr<Operator>> operators;
+    JourneyOperator *journeyOperator = nullptr;
+    TerminalFront *front = nullptr;
+    Recorder *recorder = nullptr;
+    std::unique_ptr<ChildProcess> command;
+    bool isJourney = false;
+    TimePoint lastTurn;
+    std::optional<int> result; // the exit status, once all is over
+    TimePoint patience;        // until when the command's end is waited for then
+    bool hasCommandEndedItself = false;
 };
 
 } // namespace emulator

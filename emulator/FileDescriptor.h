@@ -10,10 +10,11 @@ namespace emulator {
 class FileDescriptor {
   public:
     FileDescriptor() = default;
-    explicit FileDescriptor(int fd) : fd_(fd) {}
-    FileDescriptor(FileDescriptor &&other) noexcept : fd_(std::exchange(other.fd_, -1)) {}
+    explicit FileDescriptor(int fd) : descriptor(fd) {}
+    FileDescriptor(FileDescriptor &&other) noexcept
+        : descriptor(std::exchange(other.descriptor, -1)) {}
     FileDescriptor &operator=(FileDescriptor &&other) noexcept {
-        std::swap(fd_, other.fd_);
+        std::swap(descriptor, other.descriptor);
         return *this;
     }
     FileDescriptor(const FileDescriptor &) = delete;
@@ -21,14 +22,14 @@ class FileDescriptor {
     ~FileDescriptor() { reset(); }
 
     /// The descriptor, or -1 (which poll passes over).
-    [[nodiscard]] int get() const { return fd_; }
+    [[nodiscard]] int get() const { return descriptor; }
     void reset() {
-        if (fd_ >= 0)
-            close(std::exchange(fd_, -1));
+        if (descriptor >= 0)
+            close(std::exchange(descriptor, -1));
     }
 
   private:
-    int fd_ = -1;
+    int descriptor = -1;
 };
 
 } // namespace emulator

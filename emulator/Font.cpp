@@ -1,4 +1,4 @@
-#include "Font.h"
+#include "emulator/Font.h"
 
 namespace emulator {
 

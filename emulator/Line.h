@@ -1,7 +1,7 @@
 #pragma once
 
-#include "Clock.h"
-#include "FileDescriptor.h"
+#include "emulator/Clock.h"
+#include "emulator/FileDescriptor.h"
 
 #include <cstdint>
 #include <deque>
@@ -31,7 +31,7 @@ class Line {
     explicit Line(bool fast, const std::optional<std::string> &tracePath = std::nullopt);
 
     /// The slave's path, for the program to open.
-    [[nodiscard]] const std::string &path() const { return path_; }
+    [[nodiscard]] const std::string &path() const { return slavePath; }
     /// Readable when bytes have arrived; -1 while the backlog is full.
     [[nodiscard]] int descriptor() const;
 
@@ -46,6 +46,10 @@ class Line {
     /// that does not fit into what the program left unread is lost, as in an overrun.
     void answer(unsigned char keyCode);
 
+    /// To be called at the end. Throws std::runtime_error when not all could be written to the
+    /// trace.
+    void finishTrace();
+
   private:
     struct Arrival {
         unsigned char value;
@@ -55,16 +59,16 @@ class Line {
 
     void trace(char direction, TimePoint time, const unsigned char *bytes, std::size_t count);
 
-    FileDescriptor master_;
-    FileDescriptor slave_; // held open so that settings outlive the program's own descriptors
-    std::string path_;
-    Clock::duration byteTime_;
-    std::ofstream trace_;
-    std::deque<Arrival> backlog_;
-    TimePoint carriedUntil_; // when the line became free after the last byte given out
-    std::uint64_t answersWritten_ = 0;
-    std::uint64_t answersRead_ = 0;
-    TimePoint lookedAt_;
+    FileDescriptor master;
+    FileDescriptor slave; // held open so that settings outlive the program's own descriptors
+    std::string slavePath;
+    Clock::duration byteTime;
+    std::ofstream traceFile;
+    std::deque<Arrival> backlog;
+    TimePoint carriedUntil; // when the line became free after the last byte given out
+    std::uint64_t answersWritten = 0;
+    std::uint64_t answersRead = 0;
+    TimePoint lookedAt;
 };
 
 } // namespace emulator

@@ -1,8 +1,11 @@
-#include "Options.h"
+#include "emulator/Options.h"
 
+#include "emulator/Number.h"
+#include "emulator/StepTable.h"
+
+#include <algorithm>
+#include <array>
 #include <getopt.h>
-
-#include <charconv>
 #include <stdexcept>
 #include <string_view>
 
@@ -10,112 +13,132 @@ namespace emulator {
 
 namespace {
 
+constexpr double shortestLimit = 0.001; // seconds
 constexpr double longestLimit = 86'400;
 
-Clock::duration parseLimit(const std::string &text) {
-    double count = 0;
-    const char *end = text.data() + text.size();
-    const auto [stop, error] = std::from_chars(text.data(), end, count);
-    if (error != std::errc() || stop != end || !(count > 0 && count <= longestLimit))
-        throw std::invalid_argument("--limit wants a number of seconds, not '" + text + "'");
-    return seconds(count);
+struct OptionKind {
+    const char *name;
+    const char *value; // what stands for it in the help; null where there is none
+    std::string_view help;
+    void (*apply)(Options &options, const char *value);
+};
+
+constexpr std::array optionKinds{
+    OptionKind{"journey", "FILE",
+               "play the steps of FILE (- is standard input) instead of\n"
+               "showing the panel on the terminal",
+               [](Options &options, const char *value) { options.journey = value; }},
+    OptionKind{"show", nullptr, "also draw the panel on the terminal while a journey is played",
+               [](Options &options, const char *) { options.show = true; }},
+    OptionKind{"record", "FILE",
+               "write what is done at the panel, and what it showed, to FILE\n"
+               "as a journey that can be played again",
+               [](Options &options, const char *value) { options.record = value; }},
+    OptionKind{"pictures", "DIR", "also write each picture of the journey to DIR/NAME.svg",
+               [](Options &options, const char *value) { options.pictures = value; }},
+    OptionKind{
+        "limit", "SECONDS", "how long a step of the journey waits for the panel (default 10)",
+        [](Options &options, const char *value) {
+            options.limit =
+                seconds(parseNumber(value, shortestLimit, longestLimit, "a number of seconds"));
+        }},
+    OptionKind{"fast", nullptr, "show bytes as they come instead of at 2400 baud",
+               [](Options &options, const char *) { options.fast = true; }},
+    OptionKind{"trace", "FILE",
+               "write a line for each arrival (<) and answer (>) to FILE:\n"
+               "monotonic nanoseconds, direction, bytes in hexadecimal",
+               [](Options &options, const char *value) { options.trace = value; }},
+    OptionKind{"help", nullptr, "show this text",
+               [](Options &options, const char *) { options.help = true; }},
+};
+
+std::string optionsHelp() {
+    constexpr std::size_t indent = 21;
+    std::string text;
+    for (const OptionKind &kind : optionKinds) {
+        std::string line = kind.name == std::string_view("help") ? "  -h, --" : "  --";
+        line += kind.name;
+        if (kind.value != nullptr)
+            line += std::string(" ") + kind.value;
+        line.resize(indent, ' ');
+        for (const char c : kind.help)
+            line += c == '\n' ? "\n" + std::string(indent, ' ') : std::string(1, c);
+        text += line + "\n";
+    }
+    return text;
 }
 
 } // namespace
 
 Options Options::parse(int argc, char *const *argv) {
-    const option names[] = {
-        {"help", no_argument, nullptr, 'h'},
-        {"fast", no_argument, nullptr, 'f'},
-        {"journey", required_argument, nullptr, 'j'},
-        {"pictures", required_argument, nullptr, 'p'},
-        {"trace", required_argument, nullptr, 't'},
-        {"limit", required_argument, nullptr, 'l'},
-        {nullptr, 0, nullptr, 0},
-    };
-    Options options;
-    optind = 0; // start over, whoever parsed before
-    for (;;) {
-        switch (getopt_long(argc, argv, "+:h", static_cast<const option *>(names), nullptr)) {
-        case 'h':
-            options.help = true;
-            return options;
-        case 'f':
-            options.fast = true;
-            break;
-        case 'j':
-            options.journey = optarg;
-            break;
-        case 'p':
-            options.pictures = optarg;
-            break;
-        case 't':
-            options.trace = optarg;
-            break;
-        case 'l':
-            options.limit = parseLimit(optarg);
-            break;
-        case ':':
-            throw std::invalid_argument(std::string(argv[optind - 1]) + " wants a value");
-        case '?':
-            throw std::invalid_argument("unknown option " + std::string(argv[optind - 1]));
-        default:
-            options.command.assign(argv + optind, argv + argc);
-            if (options.command.empty())
-                throw std::invalid_argument("no command to start");
-            return options;
-        }
+    std::array<option, optionKinds.size() + 1> names{};
+    for (std::size_t k = 0; k < optionKinds.size(); k++) {
+        const OptionKind &kind = optionKinds.at(k);
+        names.at(k) = {kind.name, kind.value == nullptr ? no_argument : required_argument, nullptr,
+                       static_cast<int>(k)};
     }
+    Options options;
+    optind = 1; // start over, whoever parsed before
+    opterr = 0;
+    for (;;) {
+        const std::string argument = optind < argc ? argv[optind] : "";
+        const int found = getopt_long(argc, argv, "+:h", names.data(), nullptr);
+        if (found == ':')
+            throw std::invalid_argument(argument + " wants a value");
+        if (found == '?')
+            throw std::invalid_argument("unknown option " + argument);
+        if (found == -1)
+            break;
+        if (found == 'h')
+            options.help = true;
+        else
+            optionKinds.at(static_cast<std::size_t>(found)).apply(options, optarg);
+        if (options.help)
+            return options;
+    }
+    options.command.assign(argv + optind, argv + argc);
+    if (options.command.empty())
+        throw std::invalid_argument("no command to start");
+    if (options.show && !options.journey)
+        throw std::invalid_argument("--show goes with a --journey");
+    return options;
 }
 
-const char *Options::helpText() {
+std::string Options::helpText() {
     return R"(Usage: panel-emulator [OPTION...] -- COMMAND [ARGUMENT...]
 
 Starts COMMAND with an emulated front panel (two rows of 16 characters, four keys)
 on a pseudo-terminal, and ends it when the emulator ends. In the ARGUMENTs, {tty}
 stands for the path of the pseudo-terminal that COMMAND is to open; the
 environment variable PANEL_TTY holds it too. The line is raw, at 2400 baud both
-ways. COMMAND's standard input is empty.
+ways. COMMAND has no terminal of its own, and its standard input is empty.
 
-  --journey FILE     play the steps of FILE (- is standard input) instead of
-                     showing the panel on the terminal
-  --pictures DIR     also write each picture of the journey to DIR/NAME.svg
-  --limit SECONDS    how long a step of the journey waits for the panel (default 10)
-  --fast             show bytes as they come instead of at 2400 baud
-  --trace FILE       write a line for each arrival (<) and answer (>) to FILE:
-                     monotonic nanoseconds, direction, bytes in hex
-  -h, --help         show this text
-
+)" + optionsHelp() +
+           R"(
 On the terminal:
   arrow up, arrow down, Enter, Escape    tap the panel's key of that name
   the same with Shift, or u, d, e, x     hold the key until it is pressed again,
                                          or any other key is
-  mouse on a drawn key                   down is down, up is up
+  mouse on a drawn key                   the key is down as long as the button is
   q                                      quit
-COMMAND's output is kept back; the last of it is shown if COMMAND ends by itself.
+A key that is typed while the program does not ask for one is forgotten, as on a
+real panel. COMMAND's output is kept back; the last of it is shown if COMMAND ends
+by itself.
 
 A journey has one step a line; # begins a comment. KEY is up, down, enter or
-escape. A word with blanks stands in quotes, with \" and \\ for " and \.
-  tap KEY [N]        press the key for exactly one poll, N times; each ends when a
-                     whole poll has gone by without it
-  hold KEY POLLS     press the key and wait until it has answered that many key
-                     requests; it stays down, so another hold counts on
-  release            let go, and wait until a whole poll has gone by
-  wait SECONDS       let time pass
-  expect "ROW 0" "ROW 1"
-                     wait until the visible text is this, filled up with blanks
-  expect-cursor ROW COLUMN on|off
-                     wait until the cursor is there, blinking or not
-  picture NAME       print the panel, with v or ^ at a blinking cursor
-  say TEXT           print the rest of the line
-  limit SECONDS      how long the steps from here on wait for the panel
-  run COMMAND        have /bin/sh run the rest of the line, for 60 s at most; it
-                     must end with status 0. PANEL_TTY and PANEL_COMMAND_PID (the
-                     process that panel-emulator started) are in its environment
+escape. A word with blanks stands in quotes, with \", \\ and \n for ", \ and a
+line feed. The steps are:
+)" + stepsHelp(Stage::panel) +
+           R"(PANEL_TTY and PANEL_COMMAND_PID (the process that panel-emulator started) are in
+the environment of the commands that a journey runs.
 
+These steps can be played in the program's tests only, where time is virtual:
+)" + stepsHelp(Stage::test) +
+           R"(
 Exit status: 0 when the journey was played to its end; 1 when a step failed or
-COMMAND ended too early; 2 for wrong usage; 128 + N after signal N. On the terminal:
-that of COMMAND if it ended by itself, 0 after q.
+COMMAND ended too early, or when not everything could be written; 2 for wrong
+usage; 128 + N after signal N. On the terminal: that of COMMAND if it ended by
+itself, 0 after q.
 )";
 }
 

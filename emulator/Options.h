@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Clock.h"
+#include "emulator/Clock.h"
 
 #include <optional>
 #include <string>
@@ -12,8 +12,10 @@ namespace emulator {
 struct Options {
     bool help = false;
     bool fast = false;
+    bool show = false;
     std::optional<std::string> journey; ///< file, or "-" for standard input
     std::optional<std::string> pictures;
+    std::optional<std::string> record;
     std::optional<std::string> trace;
     Clock::duration limit = std::chrono::seconds(10);
     std::vector<std::string> command;
@@ -23,7 +25,7 @@ struct Options {
     static Options parse(int argc, char *const *argv);
 
     /// The text of `--help`.
-    static const char *helpText();
+    static std::string helpText();
 };
 
 } // namespace emulator

@@ -1,6 +1,6 @@
-#include "Picture.h"
+#include "emulator/Picture.h"
 
-#include "Font.h"
+#include "emulator/Font.h"
 
 #include <algorithm>
 
@@ -72,26 +72,26 @@ std::string rectangle(int x, int y, int w, int h, const std::string &attributes)
 
 Picture::Picture(const Display &display) {
     for (int row = 0; row < Display::rowCount; row++)
-        rows_.at(static_cast<std::size_t>(row)) = display.visibleRow(row);
+        rows.at(static_cast<std::size_t>(row)) = display.visibleRow(row);
     if (display.cursorBlinking() && display.cursorColumn() < Display::visibleColumns) {
-        cursorRow_ = display.cursorRow();
-        cursorColumn_ = display.cursorColumn();
+        cursorRow = display.cursorRow();
+        cursorColumn = display.cursorColumn();
     }
 }
 
-Picture::Picture(const Rows &rows) : rows_(rows) {
-    for (std::string &row : rows_)
+Picture::Picture(const Rows &itsRows) : rows(itsRows) {
+    for (std::string &row : rows)
         row.resize(Display::visibleColumns, ' ');
 }
 
 std::string Picture::text() const {
     const auto border = [this](int row, char mark) {
         std::string line(Display::visibleColumns, '-');
-        if (row == cursorRow_)
-            line.at(static_cast<std::size_t>(cursorColumn_)) = mark;
+        if (row == cursorRow)
+            line.at(static_cast<std::size_t>(cursorColumn)) = mark;
         return "+" + line + "+\n";
     };
-    return border(0, 'v') + "|" + printable(rows_[0]) + "|\n|" + printable(rows_[1]) + "|\n" +
+    return border(0, 'v') + "|" + printable(rows[0]) + "|\n|" + printable(rows[1]) + "|\n" +
            border(1, '^');
 }
 
@@ -104,14 +104,14 @@ std::string Picture::svg() const {
             "M" + number(textLeft) + " " + number(top + glyphRows / 2) + "h" + number(textWidth);
         for (int column = 0; column < Display::visibleColumns; column++) {
             const char character =
-                rows_.at(static_cast<std::size_t>(row)).at(static_cast<std::size_t>(column));
+                rows.at(static_cast<std::size_t>(row)).at(static_cast<std::size_t>(column));
             dots += strokes(glyph(character), textLeft + column * cellPitch, top);
         }
     }
     std::string svg =
         "<svg xmlns=\"http://www.w3.org/2000/svg\" width=\"" + number(width * pixelsPerDot) +
         "\" height=\"" + number(height * pixelsPerDot) + "\" viewBox=\"0 0 " + number(width) + " " +
-        number(height) + "\">\n<title>" + escaped(printable(rows_[0] + "|" + rows_[1])) +
+        number(height) + "\">\n<title>" + escaped(printable(rows[0] + "|" + rows[1])) +
         "</title>\n" + rectangle(0, 0, width, height, "rx=\"3\" fill=\"#22262b\"/>\n") +
         rectangle(bezel, bezel, width - 2 * bezel, height - 2 * bezel, "fill=\"#a9c23f\"/>\n") +
         "<path d=\"" + cells +
@@ -121,8 +121,8 @@ std::string Picture::svg() const {
         svg += "<path transform=\"translate(.05 .5)\" d=\"" + dots +
                "\" stroke=\"#1d2a10\" stroke-width=\".9\" stroke-dasharray=\".9 .1\"/>\n";
     }
-    if (cursorRow_ >= 0) {
-        svg += rectangle(textLeft + cursorColumn_ * cellPitch, textLeft + cursorRow_ * rowPitch,
+    if (cursorRow >= 0) {
+        svg += rectangle(textLeft + cursorColumn * cellPitch, textLeft + cursorRow * rowPitch,
                          glyphColumns, glyphRows, "fill=\"#1d2a10\" fill-opacity=\".45\">") +
                "<animate attributeName=\"visibility\" values=\"visible;hidden\" dur=\"0.8s\" "
                "calcMode=\"discrete\" repeatCount=\"indefinite\"/></rect>\n";

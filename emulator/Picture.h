@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Display.h"
+#include "emulator/Display.h"
 
 #include <array>
 #include <string>
@@ -14,7 +14,7 @@ class Picture {
 
     explicit Picture(const Display &display);
     /// A picture of two rows of text, without a cursor; rows are padded or cut to 16 columns.
-    explicit Picture(const Rows &rows);
+    explicit Picture(const Rows &itsRows);
 
     /// A frame of four lines. A blinking cursor is marked at its column in the border next to its
     /// row; bytes that are not printable ASCII show as question marks.
@@ -23,9 +23,9 @@ class Picture {
     [[nodiscard]] std::string svg() const;
 
   private:
-    Rows rows_;
-    int cursorRow_ = -1; // -1 where no cursor is seen
-    int cursorColumn_ = -1;
+    Rows rows;
+    int cursorRow = -1; // -1 where no cursor is seen
+    int cursorColumn = -1;
 };
 
 } // namespace emulator

@@ -1,19 +1,34 @@
-#include "Emulator.h"
-#include "Options.h"
+#include "emulator/Emulator.h"
+#include "emulator/Options.h"
 
+#include <fcntl.h>
 #include <fstream>
 #include <iostream>
+#include <unistd.h>
 
 namespace {
 
 constexpr int exitFailed = 1;
 constexpr int exitUsage = 2;
 
+// A message may quote what somebody else has written, and must not act on the terminal.
 int complain(int status, const std::string &message) {
-    std::cerr << "panel-emulator: " << message;
+    std::cerr << "panel-emulator: ";
+    for (const char c : message)
+        std::cerr << (static_cast<unsigned char>(c) < ' ' && c != '\n' ? '?' : c);
     if (message.back() != '\n')
         std::cerr << '\n'; // a picture at its end brings its own
     return status;
+}
+
+// The line must not become one of the standard descriptors. Those that are closed are taken by
+// something that can be neither written nor read, as a closed one is.
+void occupyStandardDescriptors() {
+    int taken = 0;
+    while (taken <= STDERR_FILENO && taken >= 0)
+        taken = open("/dev/null", O_PATH);
+    if (taken > STDERR_FILENO)
+        close(taken);
 }
 
 emulator::Journey readJourney(const std::string &path) {
@@ -28,18 +43,21 @@ emulator::Journey readJourney(const std::string &path) {
 } // namespace
 
 int main(int argc, char **argv) {
+    occupyStandardDescriptors();
     emulator::Options options;
     std::optional<emulator::Journey> journey;
     try {
         options = emulator::Options::parse(argc, argv);
         if (options.help) {
-            std::cout << emulator::Options::helpText();
-            return EXIT_SUCCESS;
+            std::cout << emulator::Options::helpText() << std::flush;
+            return std::cout ? EXIT_SUCCESS : exitFailed;
         }
         if (options.journey)
             journey = readJourney(*options.journey);
-        else if (!isatty(STDIN_FILENO) || !isatty(STDOUT_FILENO))
-            throw std::invalid_argument("not on a terminal: give a --journey");
+        const bool isDrawn = !journey || options.show;
+        if (isDrawn && (!isatty(STDIN_FILENO) || !isatty(STDOUT_FILENO)))
+            throw std::invalid_argument(journey ? "not on a terminal: nothing to --show it on"
+                                                : "not on a terminal: give a --journey");
         if (options.pictures)
             std::filesystem::create_directories(*options.pictures);
     } catch (const std::exception &error) {
