@@ -7,7 +7,7 @@ work=$(mktemp -d) || exit 1
 trap 'rm -rf "$work"' EXIT
 
 # Without their temporary folder they say one line and end: the next thing could be the host's.
-for script in tests/box/box.sh tests/box/journey.sh tests/emulator/panel-emulator.sh \
+for script in tests/box/box.sh tests/box/journey.sh \
     tests/packaging/files.sh tests/packaging/builds.sh tests/packaging/scripts.sh \
     tests/packaging/root.sh \
     scripts/demo scripts/package scripts/test scripts/test-fresh scripts/test-packages; do
