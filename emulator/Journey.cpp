@@ -43,6 +43,11 @@ bool isAboutTheKeypad(const Action &action) {
     return std::holds_alternative<step::Tap>(action) || std::holds_alternative<step::Keys>(action);
 }
 
+bool isScene(const Action &action) {
+    const auto *inTest = std::get_if<TestAction>(&action);
+    return inTest != nullptr && std::holds_alternative<step::Scene>(*inTest);
+}
+
 } // namespace
 
 Journey::Journey(std::istream &input, std::string itsName, Stage stage) : name(std::move(itsName)) {
@@ -68,6 +73,8 @@ void Journey::add(Step step) {
     if (allSteps.size() == mostSteps)
         throw std::invalid_argument("there are too many steps");
     // A tap's one poll could not be told from the hold's.
+    if (isScene(step.action))
+        isKeyDown = false;
     if (isKeyDown && isAboutTheKeypad(step.action))
         throw std::invalid_argument("a key is still held: release it first");
     if (std::holds_alternative<step::Hold>(step.action))

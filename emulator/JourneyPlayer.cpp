@@ -57,6 +57,15 @@ bool JourneyPlayer::advance(TimePoint time) {
     return true;
 }
 
+void JourneyPlayer::goTo(std::size_t step) {
+    next = step;
+    hasBegun = false;
+    for (std::size_t before = 0; before < step; before++) {
+        if (const auto *set = std::get_if<step::Limit>(&journey.steps()[before].action))
+            limit = set->time;
+    }
+}
+
 bool JourneyPlayer::play(const step::Tap &tap, bool begins) {
     if (begins)
         tapsLeft = tap.count;
@@ -168,11 +177,13 @@ bool JourneyPlayer::play(const step::Appliance &appliance, bool begins) {
     return hasSucceeded();
 }
 
-bool JourneyPlayer::play(const TestAction &action, bool) {
-    const std::string fault = surroundings.act(action);
-    if (!fault.empty())
-        fail(fault);
-    return true;
+bool JourneyPlayer::play(const TestAction &action, bool begins) {
+    if (begins) {
+        const std::string fault = surroundings.act(action);
+        if (!fault.empty())
+            fail(fault);
+    }
+    return hasSucceeded();
 }
 
 std::string JourneyPlayer::delay(const step::Expect &expect) const {
@@ -192,6 +203,10 @@ std::string JourneyPlayer::delay(const step::Run &) const {
 
 std::string JourneyPlayer::delay(const step::Appliance &) const {
     return "the appliance is still busy with it after 60 s";
+}
+
+std::string JourneyPlayer::delay(const TestAction &) const {
+    return "this has not happened\n" + shown();
 }
 
 void JourneyPlayer::awaitAnswers() {

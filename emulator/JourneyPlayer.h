@@ -33,6 +33,10 @@ class JourneyPlayer {
     /// over. Throws std::runtime_error with the message for the operator when a step fails.
     bool advance(TimePoint time);
     [[nodiscard]] TimePoint wakeAt() const { return deadline; }
+    /// The step that is being played, or will be next.
+    [[nodiscard]] std::size_t position() const { return next; }
+    /// Goes on from the beginning of that step, with the limit that is in force there.
+    void goTo(std::size_t step);
     /// Time has passed in which nobody could act, as while the emulator was stopped.
     void excuse(Clock::duration time) { deadline += time; }
 
@@ -57,6 +61,7 @@ class JourneyPlayer {
     [[nodiscard]] std::string delay(const step::ExpectCursor &cursor) const;
     [[nodiscard]] std::string delay(const step::Run &run) const;
     [[nodiscard]] std::string delay(const step::Appliance &appliance) const;
+    [[nodiscard]] std::string delay(const TestAction &action) const;
     template <typename AnyOther> [[nodiscard]] std::string delay(const AnyOther &) const {
         return unansweredKey();
     }

@@ -20,11 +20,11 @@ class Surroundings {
     virtual void start(const step::Run &run) = 0;
     /// Starts a change or a look-up at the appliance; throws when none can be started.
     virtual void start(const step::Appliance &appliance) = 0;
-    /// The exit status of what was started last, 128 + signal if a signal ended it; nothing while
-    /// it is still at work.
+    /// The exit status of what was begun last, 128 + signal if a signal ended it; nothing while
+    /// it is still at work. Throws std::runtime_error with what is wrong in a test.
     virtual std::optional<int> status() = 0;
 
-    /// Does what only a test can. Returns what is wrong, or "" when all is well.
+    /// Begins what only a test can do. Returns what is wrong, or "" when all is well.
     virtual std::string act(const TestAction &action) = 0;
 };
 
