@@ -1,5 +1,6 @@
 #include "emulator/StepTable.h"
 
+#include "emulator/ApplianceVerbs.h"
 #include "emulator/Display.h"
 #include "emulator/Font.h"
 #include "emulator/Number.h"
@@ -14,6 +15,7 @@ namespace {
 
 constexpr int mostPolls = 100'000;
 constexpr int mostTapsUntil = 100;
+constexpr int mostRepeats = 255; // of a byte
 constexpr double mostSeconds = 86'400;
 constexpr std::string_view blanks = " \t\r";
 
@@ -116,11 +118,18 @@ class Arguments {
         return sight;
     }
 
-    // Bytes in hexadecimal, to the end of the line.
+    // Bytes in hexadecimal, to the end of the line; 20*40 is the byte 20 forty times.
     std::string takeBytes() {
         std::string bytes;
-        while (!isEmpty())
-            bytes += static_cast<char>(parseByte(take()));
+        while (!isEmpty()) {
+            const std::string word = take();
+            const std::size_t star = std::min(word.find('*'), word.size());
+            const int times = star == word.size()
+                                  ? 1
+                                  : parseNumber(word.substr(star + 1), 1, mostRepeats, "a count");
+            bytes.append(static_cast<std::size_t>(times),
+                         static_cast<char>(parseByte(word.substr(0, star))));
+        }
         return bytes;
     }
 
@@ -228,6 +237,7 @@ Action parseAppliance(Arguments &words) {
     do {
         appliance.words.push_back(words.take());
     } while (!words.isEmpty());
+    checkVerb(appliance.words);
     return appliance;
 }
 
@@ -303,7 +313,7 @@ constexpr std::array stepKinds{
              Stage::panel, parseRun},
     StepKind{"appliance", "VERB...",
              "have something happen at the appliance that the program runs on, or\n"
-             "look something up there; the box tells which verbs there are",
+             "look something up there, by the verbs below",
              Stage::panel, parseAppliance},
     StepKind{"scene", "TITLE",
              "set up a fresh appliance, whose program starts at the next step that is\n"
@@ -311,7 +321,8 @@ constexpr std::array stepKinds{
              Stage::test, parseScene},
     StepKind{"prints", "\"COMMAND\" \"OUTPUT\"",
              "what this command line of the program prints from here on", Stage::test, parsePrints},
-    StepKind{"answer", "HEX...", "the panel's next answer is just these bytes", Stage::test,
+    StepKind{"answer", "HEX...",
+             "the panel's next answer is just these bytes; 20*40 is 20 forty times", Stage::test,
              parseAnswer},
     StepKind{"expect-sent", "[HEX...]",
              "just these bytes have been sent since the last step that pressed a key;\n"
@@ -365,7 +376,7 @@ std::string stepsHelp(Stage stage) {
             line += c == '\n' ? "\n" + std::string(indent, ' ') : std::string(1, c);
         text += line + "\n";
     }
-    return text;
+    return text + (stage == Stage::panel ? "The appliance's verbs are:\n" + verbsHelp() : "");
 }
 
 std::string quoted(std::string_view text) {
