@@ -2,8 +2,12 @@
 #include "emulator/JourneyPlayer.h"
 #include "emulator/Line.h"
 
-#include <fcntl.h>
 #include <gtest/gtest.h>
+
+#include <fcntl.h>
+
+#include <algorithm>
+#include <fstream>
 #include <set>
 #include <sstream>
 
@@ -107,35 +111,120 @@ template <typename Action> std::string refusal(Action action) try {
 }
 
 TEST(Journey, RefusesWrongStepsWithTheirLine) {
-    for (const std::string step :
-         {"jump", "tap", "tap left", "tap up 0", "hold up", "hold up 2x", "wait nan", "limit -1",
-          "expect \"a\"", "expect \"a", "expect \"12345678901234567\" \"\"", "release now", "run",
-          "expect-cursor 2 0 on", "expect-cursor 0 0 yes", "picture ../x", "tap up"}) {
+    for (const std::string step : {"jump",
+                                   "tap",
+                                   "tap left",
+                                   "tap up 0",
+                                   "tap up until",
+                                   "tap up 2 till \"a\"",
+                                   "keys",
+                                   "keys uz",
+                                   "keys u0",
+                                   "hold up",
+                                   "hold up 2x",
+                                   "wait nan",
+                                   "limit -1",
+                                   "expect",
+                                   "expect \"a",
+                                   "expect \"a\\b\"",
+                                   "expect \"12345678901234567\"",
+                                   "expect \"\xC3\xA4\"",
+                                   "expect \"a\\nb\"",
+                                   "release now",
+                                   "run",
+                                   "expect-cursor 2 0 on",
+                                   "expect-cursor 0 0 yes",
+                                   "picture ../x",
+                                   "tap up",
+                                   "keys u",
+                                   "\x1B[2J",
+                                   "say \x01",
+                                   "scene one",
+                                   "answer B8",
+                                   "appliance",
+                                   "appliance explode",
+                                   "appliance port eth0",
+                                   "appliance port eth0 10.1.1.1",
+                                   "appliance port eth0 10.1.1.1/33",
+                                   "appliance script sleeps",
+                                   "appliance hostname -F",
+                                   "appliance file etc x",
+                                   "appliance has gateway 10.1.1.256 eth0"}) {
         const std::string message = refusal([&] { parse("hold up 1\n# then\n" + step); });
-        EXPECT_EQ(message.substr(0, 8), "trip:3: ") << step;
+        EXPECT_EQ(message.substr(0, 8), "trip:3: ") << step << ": " << message;
+        EXPECT_EQ(message.find('\x1B'), std::string::npos);
     }
+    EXPECT_EQ(refusal([] { parse(" \n# nothing\n"); }), "trip: there is no step in it");
+    parse("say " + std::string(4092, '.'));
+    EXPECT_EQ(refusal([] { parse("say a\nsay " + std::string(4093, '.')); }),
+              "trip:2: the line is too long");
 }
+
+// The words of a usage, in small letters; the manual page's macros, like Ic, are none.
+std::vector<std::string> words(std::string text) {
+    std::replace_if(
+        text.begin(), text.end(), [](char c) { return isalnum(c) == 0 && c != '-'; }, ' ');
+    std::vector<std::string> all;
+    std::istringstream input(text);
+    for (std::string word; input >> word;) {
+        const bool isMacro = word.size() == 2 && isupper(word[0]) != 0 && islower(word[1]) != 0;
+        std::transform(word.begin(), word.end(), word.begin(), tolower);
+        if (!isMacro)
+            all.push_back(word);
+    }
+    return all;
+}
+
+TEST(StepTable, AndTheManualPageListTheSame) {
+    std::vector<std::vector<std::string>> inHelp, inPage;
+    std::istringstream help(stepsHelp(Stage::panel) + stepsHelp(Stage::test));
+    for (std::string line; std::getline(help, line);) {
+        if (line.substr(0, 2) == "  " && line[2] != ' ')
+            inHelp.push_back(words(line.substr(0, std::min(line.find("  ", 2), line.size()))));
+    }
+    std::ifstream page(MANUAL_PAGE);
+    for (std::string line; std::getline(page, line);) {
+        if (line.substr(0, 7) == ".It Ic ")
+            inPage.push_back(words(line));
+    }
+    EXPECT_GT(inHelp.size(), 20U);
+    std::sort(inHelp.begin(), inHelp.end());
+    std::sort(inPage.begin(), inPage.end());
+    EXPECT_EQ(inHelp, inPage);
+}
+
+struct Nowhere : Surroundings {
+    void start(const step::Run &) override {}
+    void start(const step::Appliance &appliance) override { began += appliance.words[0]; }
+    std::optional<int> status() override { return ended; }
+    std::string act(const TestAction &) override { return "no test"; }
+
+    std::string began;
+    std::optional<int> ended;
+};
 
 struct Trip {
     explicit Trip(const std::string &text)
-        : player(parse(text), {display, keypad}, output, std::chrono::seconds(1)) {}
+        : player(parse(text), {display, keypad}, surroundings, output, std::chrono::seconds(1)) {}
 
     Display display;
     std::string polls; // one character each: the key's initial, or a full stop
     Keypad keypad{[this](Key key) { polls.back() = traits(key).name.front(); }};
     std::ostringstream output;
+    Nowhere surroundings;
     JourneyPlayer player;
     TimePoint now;
 };
 
 TEST(JourneyPlayer, CountsKeysInPolls) {
-    Trip trip("tap up 2 # twice\nhold down 3\nhold down 2\nhold enter 1\nrelease\nsay # yes");
+    Trip trip("tap up 2 # twice\nhold down 3\nhold down 2\nhold enter 1\nrelease\nsay # yes\n"
+              "keys u3x d");
     while (!trip.player.advance(trip.now) && trip.polls.size() < 50) {
         trip.polls += '.';
         // The second request was on the line before the first one's answer was read.
         trip.keypad.request(trip.polls.size() != 2);
     }
-    EXPECT_EQ(trip.polls, "u..u.ddddde..");
+    EXPECT_EQ(trip.polls, "u..u.ddddde.uuu.e.d..");
     EXPECT_EQ(trip.output.str(), "# yes\n");
 }
 
@@ -149,6 +238,32 @@ TEST(JourneyPlayer, WaitsForWhatIsExpectedUpToTheLimit) {
     const std::string message = refusal([&] { trip.player.advance(trip.now); });
     EXPECT_EQ(message.substr(0, 8), "trip:4: ");
     EXPECT_LT(message.find("|gone            |"), message.find("|say \"\\          |")) << message;
+}
+
+TEST(JourneyPlayer, TapsUntilThePanelShowsIt) {
+    Trip trip("tap up 3 until there\ntap up 2 until gone");
+    std::string message = "none";
+    while (message == "none" && trip.polls.size() < 50) {
+        message = refusal([&] { trip.player.advance(trip.now); });
+        trip.polls += '.';
+        trip.keypad.request(true);
+        if (trip.polls.size() == 5)
+            trip.display = showing("there");
+    }
+    EXPECT_EQ(trip.polls.substr(0, 10), "u.u.u.u...") << message;
+    EXPECT_EQ(message.substr(0, 14), "trip:2: after ");
+}
+
+TEST(JourneyPlayer, WaitsForTheApplianceAndMindsItsStatus) {
+    Trip trip("appliance refresh\nappliance reboot");
+    EXPECT_FALSE(trip.player.advance(trip.now));
+    trip.surroundings.ended = 0;
+    EXPECT_TRUE(trip.player.advance(trip.now));
+    EXPECT_EQ(trip.surroundings.began, "refreshreboot");
+    Trip failing("appliance has hostname box");
+    failing.surroundings.ended = 3;
+    EXPECT_EQ(refusal([&] { failing.player.advance(failing.now); }),
+              "trip:1: it ended with status 3");
 }
 
 } // namespace
