@@ -14,7 +14,8 @@ std::string settingsOf(const NetworkConfig &config) {
 }
 
 NetworkConfig loaded(const std::string &interfaces, const std::string &servers) {
-    world().files = {{"/etc/network/interfaces", interfaces}, {"/etc/resolv.conf", servers}};
+    world().appliance.files = {{"/etc/network/interfaces", interfaces},
+                               {"/etc/resolv.conf", servers}};
     NetworkConfig config("eth1");
     config.load();
     return config;
@@ -22,7 +23,7 @@ NetworkConfig loaded(const std::string &interfaces, const std::string &servers) 
 
 } // namespace
 
-TEST(Config, AStanzaIsReadAsItStands) {
+FRESH_TEST(Config, AStanzaIsReadAsItStands) {
     const std::string head = "auto eth1\niface eth1 inet static\n";
     const std::vector<std::pair<std::string, std::string>> cases = {
         {"iface eth1 inet dhcp\naddress 10.1.1.1\n", "dhcp [] [] []"},
@@ -42,14 +43,14 @@ TEST(Config, AStanzaIsReadAsItStands) {
          "static [] [] [gateway]"},
         {head + "address\t10.0.0.5\nnetmask 255.0.0.0\r\ngateway address 1.2.3.4\n",
          "static [1.2.3.4] [255.0.0.0\r] []"},
-        {head + "address 10.0.0.5 \n\n", "static [] [] []"},
+        {head + "address 10.0.0.5 \nnetmas 1.1.1.1\ngatewa 1.1.1.1\n\n", "static [] [] []"},
         {"", "static [] [] []"},
     };
     for (const auto &[interfaces, settings] : cases)
         EXPECT_EQ(settingsOf(loaded(interfaces, "")), settings) << interfaces;
 }
 
-TEST(Config, ServersAreReadFromTheirOwnFileButNotWithoutTheOther) {
+FRESH_TEST(Config, ServersAreNotReadWithoutTheInterfaces) {
     const std::string servers = "nameserver 8.8.8.8\nnameserver 0.0.0.0\nnameserver \n"
                                 "# nameserver 1.1.1.1\n nameserver 2.2.2.2\nnameserver\t3.3.3.3\n"
                                 "nameserver  9.9.9.9";
@@ -64,12 +65,12 @@ TEST(Config, ServersAreReadFromTheirOwnFileButNotWithoutTheOther) {
     config.addDns("");
     EXPECT_EQ(settingsOf(config), "static [] [] [] 8.8.8.8  9.9.9.9");
     config.setAddress("10.1.1.1");
-    world().files.erase("/etc/network/interfaces");
+    world().appliance.files.erase("/etc/network/interfaces");
     config.load();
     EXPECT_EQ(settingsOf(config), "static [] [] []");
 }
 
-TEST(Config, SettingsBecomeACommandLineOrARefusal) {
+FRESH_TEST(Config, SettingsBecomeACommandLine) {
     struct Case {
         bool dhcp;
         std::string address, netmask, gateway, options, refusal;
@@ -97,21 +98,23 @@ TEST(Config, SettingsBecomeACommandLineOrARefusal) {
         config.setGateway(test.gateway);
         config.setDns(1, "0.0.0.0");
         world().events.clear();
-        EXPECT_EQ(config.apply(), test.refusal);
         std::vector<std::string> expected;
         if (test.refusal.empty())
             expected = {applyScript + "iface --name eth1" + test.options + ";echo $?"};
+        for (const std::string &command : expected)
+            world().appliance.prints[command] = "0\n";
+        EXPECT_EQ(config.apply(), test.refusal);
         EXPECT_EQ(world().commands("run"), expected);
     }
     NetworkConfig bare = loaded("iface eth1 inet dhcp\n", "");
-    world().events.clear();
-    for (const std::string output : {"0\n", "0", "0x"}) {
-        world().scriptOutput = output;
-        EXPECT_EQ(bare.apply(), "");
+    std::string &output =
+        world().appliance.prints[applyScript + "iface --name eth1 --dhcp;echo $?"];
+    for (const std::string good : {"0\n", "0", "0x"}) {
+        output = good;
+        EXPECT_EQ(bare.apply(), "") << output;
     }
-    EXPECT_EQ(world().commands("run").front(), applyScript + "iface --name eth1 --dhcp;echo $?");
-    for (const std::string output : {"1\n", "127\n", "", "note\n0\n", " 0\n"}) {
-        world().scriptOutput = output;
+    for (const std::string bad : {"1\n", "127\n", "", "note\n0\n", " 0\n"}) {
+        output = bad;
         EXPECT_EQ(bare.apply(), "Check Logfile") << output;
     }
     world().shellWorks = false;

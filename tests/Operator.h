@@ -1,39 +1,57 @@
-// An operator at the rack, in virtual time: presses keys, waits, and reads the two rows.
+// What most tests need to meet the program: a fresh process, and an operator who goes turn by turn.
 #pragma once
 
 #include "World.h"
 
-#include "runtime/KeyCode.h"
 #include "runtime/MainLoop.h"
 #include "status/MainMenu.h"
 
 #include <gtest/gtest.h>
 
-/// The appliance that most tests start from: a hardware model with one configured port.
-void standardAppliance(World &appliance);
+#include <functional>
+
+/// Runs a check in a process of its own, so that it meets a program that has just been started.
+/// Returns whether it held; a failure is printed there.
+[[nodiscard]] bool holdsInFreshProgram(const std::function<void()> &check);
+
+/// A test that meets a program which has just been started, whatever has run before it.
+class FreshProgram : public testing::Test {
+  protected:
+    virtual void check() = 0;
+
+  private:
+    void TestBody() final {
+        EXPECT_TRUE(holdsInFreshProgram([this] { check(); })) << "see above";
+    }
+};
+
+/// Defines such a test; its body follows.
+#define FRESH_TEST(suite, name)                                                                    \
+    class suite##name : public FreshProgram {                                                      \
+        void check() override;                                                                     \
+    };                                                                                             \
+    const auto *const suite##name##Registered =                                                    \
+        testing::RegisterTest(#suite, #name, nullptr, nullptr, __FILE__, __LINE__,                 \
+                              []() -> FreshProgram * { return new suite##name; });                 \
+    void suite##name::check()
+
+/// An appliance with one port, for tests that count pages.
+void standardAppliance();
 
 class Operator {
   public:
     /// Starts the program on the world as it is now.
-    Operator() : loop(running = new MainLoop(MainMenu::instance, MainMenu::requestRefresh)) {}
+    Operator() : loop(new MainLoop(MainMenu::instance, MainMenu::requestRefresh)) {}
 
-    void poll(KeyCode key = keyNone);       ///< one turn, with this key down or none
-    void hold(KeyCode key, int polls);      ///< that many turns with the key down, then release
-    void press(KeyCode key, int times = 1); ///< as short as the keypad can tell, then released
-    /// Presses u, d, e (Enter) and x (Escape) in order; a number holds the key before it so long.
-    void keys(const std::string &sequence);
-    void answer(const std::string &bytes);      ///< one turn in which the panel sends just these
-    void wait(double seconds);                  ///< turns without a key
-    void waitForPage(const std::string &title); ///< until row 0 begins with this; fails in the end
+    void poll(); ///< one turn without a key
+    void poll(emulator::Key key);
+    void answer(const std::string &bytes);        ///< one turn in which the panel sends just these
+    void hold(emulator::Key key, int polls);      ///< and then release it
+    void press(emulator::Key key, int times = 1); ///< each as short as the keypad can tell
+    void wait(double seconds);                    ///< turns without a key
 
-    static std::string sees();
-    /// Where the cursor blinks, as "row,column", or "off".
-    static std::string cursor();
+    static std::string sees() { return world().shown(); }
 
   private:
-    static MainLoop *running; // the program never ends, and neither does its loop
-    MainLoop *loop;
+    MainLoop *loop; // as the program's, it never ends
 };
-
-/// Runs a check in a process of its own, so that it meets a program that has just been started.
-void inFreshProgram(const std::function<void()> &check);

@@ -1,10 +1,9 @@
 #include "Operator.h"
 
 #include "runtime/LcdPanel.h"
+#include "runtime/String.h"
 #include "runtime/runCommand.h"
 #include "runtime/splitString.h"
-
-#include <csignal>
 
 namespace {
 
@@ -16,7 +15,7 @@ std::string sentBy(const std::function<void(LcdPanel &)> &action) {
 
 } // namespace
 
-TEST(Runtime, TheLineIsConfiguredAndThePanelClearedBeforeMain) {
+FRESH_TEST(Runtime, TheLineIsConfiguredBeforeMain) {
     EXPECT_EQ(world().sent, "\xFE\x28\xFE\x28\xFE\x01\xFE\x02");
     EXPECT_EQ(world().writes, std::vector<std::size_t>(8, 1));
     const std::string onDevice = "stty -F /dev/ttyS1 ";
@@ -32,22 +31,7 @@ TEST(Runtime, TheLineIsConfiguredAndThePanelClearedBeforeMain) {
     EXPECT_EQ(world().settings, settings);
 }
 
-TEST(Runtime, AKeyIsHeldShortOnPollsTwoToFiveAndLongFromTheSixth) {
-    LcdPanel &panel = *LcdPanel::instance();
-    for (const KeyCode key : {keyUp, keyDown, keyEnter, keyEscape}) {
-        for (int poll = 1; poll <= 8; ++poll) {
-            panel.countKey(key);
-            for (KeyCode each = 0; each <= 5; ++each) {
-                EXPECT_EQ(panel.isHeldShort(each), each == key && poll >= 2 && poll <= 5);
-                EXPECT_EQ(panel.isHeldLong(each), each == key && poll >= 6);
-            }
-        }
-    }
-    panel.countKey(keyNone);
-    EXPECT_FALSE(panel.isHeldShort(keyEscape) || panel.isHeldLong(keyEscape));
-}
-
-TEST(Runtime, AnAnswerIsReadFromItsSecondByteAndAnythingElseEndsTheHold) {
+FRESH_TEST(Runtime, AnAnswerIsReadFromItsSecondByte) {
     const std::vector<std::pair<std::string, KeyCode>> cases = {
         {"\x80\xBE", keyUp},
         {std::string("\0\xBD", 2), keyDown},
@@ -62,13 +46,13 @@ TEST(Runtime, AnAnswerIsReadFromItsSecondByteAndAnythingElseEndsTheHold) {
     for (const auto &[answer, key] : cases) {
         panel.countKey(keyUp);
         panel.countKey(keyUp);
-        world().answers = {answer.substr(0, 255)};
+        world().unread = answer.substr(0, 255);
         EXPECT_EQ(panel.pollKey(), key);
         EXPECT_EQ(panel.isHeldShort(keyUp), key == keyUp);
     }
 }
 
-TEST(Runtime, CommandsAreTwoSingleBytesAndTheCursorGoesWhereItIsSent) {
+FRESH_TEST(Runtime, TheCursorGoesWhereItIsSent) {
     const auto cursorAt = [](int row, int column) {
         return sentBy([&](LcdPanel &panel) { panel.setCursor(row, column); });
     };
@@ -90,7 +74,7 @@ TEST(Runtime, CommandsAreTwoSingleBytesAndTheCursorGoesWhereItIsSent) {
     EXPECT_EQ(world().writesTried, 1);
 }
 
-TEST(Runtime, ATextIsTwoRowsOfSixteenAndTheRestIsDroppedOrScrolled) {
+FRESH_TEST(Runtime, ATextIsTwoRowsOfSixteen) {
     const std::vector<std::tuple<std::string, std::string, int>> cases = {
         {"", "|", 0},
         {"one", "one|", 0},
@@ -108,7 +92,7 @@ TEST(Runtime, ATextIsTwoRowsOfSixteenAndTheRestIsDroppedOrScrolled) {
     EXPECT_EQ(world().display.hiddenCharacters(), 0U);
 }
 
-TEST(Runtime, TheMarqueeGoesRoundBothWaysAndShortTextsLeaveTheRestOfTheRow) {
+FRESH_TEST(Runtime, TheMarqueeGoesRoundBothWays) {
     LcdPanel &panel = *LcdPanel::instance();
     const std::string name = "abcdefghijklmnopqrst"; // 20 characters
     const std::string cycle = name + "   " + name;
@@ -132,7 +116,7 @@ TEST(Runtime, TheMarqueeGoesRoundBothWaysAndShortTextsLeaveTheRestOfTheRow) {
     }
 }
 
-TEST(Runtime, SplittingKeepsEmptyPiecesButForTheLast) {
+FRESH_TEST(Runtime, SplittingKeepsEmptyPiecesButForTheLast) {
     using Pieces = std::vector<QLX::String<char>>;
     EXPECT_EQ(splitString("x\ny\n ", "\n"), (Pieces{"x", "y", " "}));
     EXPECT_EQ(splitString("\nx", "\n"), (Pieces{"", "x"}));
@@ -143,9 +127,9 @@ TEST(Runtime, SplittingKeepsEmptyPiecesButForTheLast) {
     EXPECT_EQ(splitString("x,y", ""), (Pieces{"x,y"}));
 }
 
-TEST(Runtime, AllOutputIsCapturedAndBackgroundCommandsAreNotWaitedFor) {
+FRESH_TEST(Runtime, AllOutputIsCaptured) {
     const std::string longLine(1000, 'x');
-    world().outputs = {{"many", "a\n" + longLine + "\n\nno end"}, {"none", ""}};
+    world().appliance.prints = {{"many", "a\n" + longLine + "\n\nno end"}, {"none", ""}};
     EXPECT_EQ(runCommand("many", true), "a\n" + longLine + "\n\nno end");
     EXPECT_EQ(runCommand("none", true), "");
     EXPECT_EQ(runCommand("later", false), "");
@@ -154,33 +138,15 @@ TEST(Runtime, AllOutputIsCapturedAndBackgroundCommandsAreNotWaitedFor) {
     EXPECT_EQ(runCommand("many", true), "ERROR");
 }
 
-TEST(Runtime, ASignalAtAnyTimeRefreshesThePagesAndEndsAHold) {
-    const auto interrupt = [] { raise(SIGUSR1); };
-    standardAppliance(world());
-    world().duringCommand = interrupt; // while the main menu is being built
-    Operator person;
-    const auto listings = [] { return world().commands("run echo").size(); };
-    EXPECT_EQ(listings(), 1U);
-    person.poll();
-    EXPECT_EQ(listings(), 2U);
-
-    world().duringPause = interrupt;
-    person.poll();
-    person.press(keyDown);
-    EXPECT_EQ(listings(), 3U);
-    EXPECT_EQ(Operator::sees(), "Kestrova (TM)|cabinetDevice");
-
-    person.poll(keyDown);
-    EXPECT_EQ(Operator::sees(), "Hostname:|monitor");
-    world().duringPoll = interrupt;
-    person.poll(keyDown); // not read: no key, and a new start at the first page
-    EXPECT_EQ(Operator::sees(), "Kestrova (TM)|cabinetDevice");
-    person.poll(keyDown); // the key never left the keypad, yet counts as pressed again
-    EXPECT_EQ(Operator::sees(), "Hostname:|monitor");
-
-    world().duringCommand = interrupt; // during a rebuild: asks for another one
-    raise(SIGUSR1);
-    person.poll();
-    person.poll();
-    EXPECT_EQ(listings(), 6U);
+FRESH_TEST(Runtime, TrimmingStripsBothEnds) {
+    using Text = QLX::String<char>;
+    Text text = "  a b  ";
+    EXPECT_EQ(Text(text).trimRight(" "), "  a b");
+    EXPECT_EQ(Text(text).trimLeft(" a"), "b  ");
+    EXPECT_EQ(&text.trim(), &text);
+    EXPECT_EQ(text, "a b");
+    Text blanks = "   ";
+    EXPECT_THROW(Text(blanks).trimLeft(" "), std::out_of_range);
+    EXPECT_EQ(blanks.trim(), "");
+    EXPECT_EQ(blanks.trimLeft(" ") + blanks.trimRight(" "), "");
 }

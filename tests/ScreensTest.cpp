@@ -4,47 +4,50 @@
 #include "netconfig/RestartNetworkingMenu.h"
 #include "runtime/MenuContext.h"
 
-TEST(Screens, TheRestartIsWaitedForUntilItsProcessesAreGoneOrAKeyComes) {
+using emulator::Key;
+using namespace std::chrono_literals;
+
+FRESH_TEST(Screens, TheRestartIsWaitedForUntilAKeyComes) {
     const std::string check =
         "ps aux | egrep '/etc/init.d/networking|/opt/scripts/configureHostname.sh' | grep -v grep";
-    standardAppliance(world());
-    world().outputs[check] = "root 1 /etc/init.d/networking restart\n";
+    standardAppliance();
+    world().appliance.prints[check] = "root 1 /etc/init.d/networking restart\n";
     auto *screen = RestartNetworkingMenu::instance();
     MenuContext context(screen);
     const auto checks = [&] { return world().commands("run " + check).size(); };
     context.display();
     EXPECT_EQ(Operator::sees(), "Restarting|Networking");
-    EXPECT_EQ(world().pauses, std::vector<std::string>{"1 s Restarting|Networking"});
+    EXPECT_EQ(world().pauses.back().what, "1000 ms");
     EXPECT_EQ(checks(), 1U);
-    world().microseconds += 1'000'000;
+    world().now += 1s;
     context.display();
     EXPECT_EQ(checks(), 1U);
-    world().microseconds += 1;
+    world().now += Micros(1);
     context.display();
     EXPECT_EQ(checks(), 2U);
     world().clockWorks = false;
     context.display();
     world().clockWorks = true;
     EXPECT_EQ(checks(), 2U);
-    world().outputs[check] = "";
-    world().microseconds += 1'000'001;
+    world().appliance.prints[check] = "";
+    world().now += Micros(1'000'001);
     context.display();
     context.display();
     EXPECT_EQ(Operator::sees(), "Kestrova (TM)|cabinetDevice");
-    world().outputs[check] = "still running";
+    world().appliance.prints[check] = "still running";
     for (const auto key : {&MenuContext::onUp, &MenuContext::onDown, &MenuContext::onEscape,
                            &MenuContext::onEnter}) {
         context.setMenu(screen);
         context.display();
         EXPECT_EQ(Operator::sees(), "Restarting|Networking");
         (context.*key)();
-        world().microseconds += 100'000'000;
+        world().now += 100s;
         context.display();
         EXPECT_NE(Operator::sees(), "Restarting|Networking");
     }
 }
 
-TEST(Screens, AnEditorWithoutSettingsDrawsAndStoresNothing) {
+FRESH_TEST(Screens, AnEditorWithoutSettingsDoesNothing) {
     auto *screen = IfaceStaticEditIPMenu::instance();
     MenuContext context(screen);
     world().sent.clear();
@@ -56,16 +59,32 @@ TEST(Screens, AnEditorWithoutSettingsDrawsAndStoresNothing) {
     EXPECT_EQ(Operator::sees(), "> Set IP Addr|  Set Netmask  v");
 }
 
-TEST(Screens, EnterOnAPortComputesThePageBeforeItAndReadsBothFiles) {
-    standardAppliance(world());
+FRESH_TEST(Screens, EnterOnAPortComputesThePageBeforeIt) {
+    standardAppliance();
     Operator person;
-    person.waitForPage("Connected to:");
-    person.press(keyDown);
-    world().files["/etc/network/interfaces"] = "";
+    person.press(Key::down, 4); // to the first port
+    world().appliance.files["/etc/network/interfaces"] = "";
     world().events.clear();
-    person.poll(keyEnter);
+    person.poll(Key::enter);
     EXPECT_EQ(world().commands("open"),
               (std::vector<std::string>{"/etc/network/interfaces", "/etc/resolv.conf",
                                         "/opt/kestrova/seq.site_conn",
                                         "/opt/kestrova/config/nis.config"}));
+}
+
+FRESH_TEST(Screens, TheAlphabetGoesRoundBothWays) {
+    const std::string alphabet = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789-";
+    standardAppliance();
+    world().appliance.settings["hostname"] = "a";
+    Operator person;
+    person.press(Key::down, 2);
+    person.press(Key::enter);
+    for (std::size_t k = 1; k <= alphabet.length(); ++k) {
+        person.press(Key::down);
+        EXPECT_EQ(world().display.visibleRow(1)[0], alphabet[k % alphabet.length()]);
+    }
+    for (std::size_t k = alphabet.length(); k-- > 0;) {
+        person.press(Key::up);
+        EXPECT_EQ(world().display.visibleRow(1)[0], alphabet[k]);
+    }
 }

@@ -3,7 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <cerrno>
-#include <cstdarg>
 #include <cstdio>
 #include <dlfcn.h>
 #include <fcntl.h>
@@ -13,6 +12,8 @@
 #include <sys/time.h>
 #include <unistd.h>
 
+using namespace std::chrono_literals;
+
 World &world() {
     static auto *const theWorld = new World;
     return *theWorld;
@@ -21,24 +22,20 @@ World &world() {
 namespace {
 
 constexpr int panelDescriptor = 4242;
-constexpr long long pollTimeout = 500'000, answerTime = 25'000, turnPause = 100'000; // microseconds
+constexpr Micros pollTimeout = 500ms, answerTime = 25ms, turnPause = 100ms;
 
-bool startsWith(const std::string &text, const std::string &beginning) {
-    return text.compare(0, beginning.length(), beginning) == 0;
+// What the program may look for, whether or not the appliance has it.
+const std::set<std::string> &knownFiles() {
+    static const std::set<std::string> known = {"/etc/ma-platform", "/etc/network/interfaces",
+                                                "/etc/resolv.conf", "/opt/kestrova/seq.site_conn",
+                                                "/opt/kestrova/config/nis.config"};
+    return known;
 }
 
-// What stands between `before` and `after` in a command line made of just these three.
-bool between(const std::string &command, const std::string &before, const std::string &after,
-             std::string &name) {
-    if (!startsWith(command, before) || command.length() < before.length() + after.length())
-        return false;
-    name = command.substr(before.length(), command.length() - before.length() - after.length());
-    return before + name + after == command;
-}
-
-void once(std::function<void()> &event) {
-    if (event)
-        std::exchange(event, nullptr)();
+bool isTestsOwn(const std::string &path) {
+    const char *byHand = getenv("PANEL_JOURNEY");
+    return startsWith(path, SOURCE "/") || startsWith(path, testing::TempDir()) ||
+           (byHand != nullptr && path == byHand);
 }
 
 FILE *openContents(const std::string &contents) {
@@ -47,6 +44,11 @@ FILE *openContents(const std::string &contents) {
         abort();
     lseek(descriptor, 0, SEEK_SET);
     return fdopen(descriptor, "r");
+}
+
+int interrupted() {
+    errno = EINTR;
+    return -1;
 }
 
 } // namespace
@@ -60,42 +62,6 @@ std::string World::shown() const {
            withoutBlanksAtEnd(display.visibleRow(1));
 }
 
-std::string World::run(const std::string &command) {
-    static const std::string listing =
-        "echo \"`ifconfig -s |       sed 1d |       egrep -v 'lo|ani|docker|v|ipsec_|ssl_' |"
-        "       awk '{ print $1 } '`\\neth4\\neth5\" |       sort -u | tr '\n' ','";
-    if (const auto fixed = outputs.find(command); fixed != outputs.end())
-        return fixed->second;
-    std::string name;
-    if (command == listing) {
-        std::set<std::string> names = {"eth4", "eth5"};
-        for (const auto &port : portAddresses)
-            names.insert(port.first);
-        std::string joined;
-        for (const auto &each : names)
-            joined += each + ",";
-        return joined;
-    }
-    if (between(command, "ifconfig ", " | grep 'inet' | awk '{ print $2 }' | head -n1", name)) {
-        const std::string address = portAddresses.count(name) ? portAddresses[name] : "";
-        return address.empty() ? "" : address + "\n";
-    }
-    if (between(command, "ifconfig | grep '", "'", name)) {
-        return portAddresses.count(name) ? name + ": flags=4163<UP>  mtu 1500\n" : "";
-    }
-    if (between(command,
-                "cat /etc/network/interfaces 2>/dev/null |         grep -v \"#\" | grep \"iface ",
-                " \" |         awk '{ print $4 }'", name)) {
-        return portMethods.count(name) ? portMethods[name] + "\n" : "";
-    }
-    if (command == "hostname")
-        return hostname;
-    if (startsWith(command, applyScript))
-        return scriptOutput;
-    ADD_FAILURE() << "a command that no appliance knows: " << command;
-    return "";
-}
-
 std::vector<std::string> World::commands(const std::string &beginning) const {
     std::vector<std::string> found;
     for (const auto &event : events) {
@@ -105,90 +71,96 @@ std::vector<std::string> World::commands(const std::string &beginning) const {
     return found;
 }
 
+void World::pass(Micros time, bool forAnswer) {
+    const Micros end = now + time;
+    const auto isOver = [&] { return hasSignalled || (forAnswer && !unread.empty()); };
+    if (onlooker != nullptr)
+        onlooker->look();
+    while (!isOver() && now < end) {
+        now = onlooker == nullptr ? end : std::min(end, onlooker->wakeAt());
+        if (onlooker != nullptr)
+            onlooker->look();
+    }
+}
+
 // The calls of the program, and of nobody else, are led here by the linker, which gives the names.
 // NOLINTBEGIN(bugprone-reserved-identifier,readability-inconsistent-declaration-parameter-name)
 extern "C" {
 
-int __real_open(const char *path, int flags, mode_t mode);
 ssize_t __real_read(int descriptor, void *buffer, size_t size);
 ssize_t __real_write(int descriptor, const void *bytes, size_t size);
-int __real_poll(pollfd *descriptors, nfds_t count, int timeout);
 
 int __wrap_open(const char *path, int flags, ...) {
-    if (std::string(path) == "/dev/ttyS1") {
-        EXPECT_EQ(flags, O_RDWR | O_NONBLOCK);
-        return panelDescriptor;
-    }
-    va_list rest;
-    va_start(rest, flags);
-    const auto mode = va_arg(rest, mode_t);
-    va_end(rest);
-    return __real_open(path, flags, mode);
+    EXPECT_STREQ(path, "/dev/ttyS1");
+    EXPECT_EQ(flags, O_RDWR | O_NONBLOCK);
+    return panelDescriptor;
 }
 
 ssize_t __wrap_write(int descriptor, const void *bytes, size_t size) {
     if (descriptor != panelDescriptor)
         return __real_write(descriptor, bytes, size);
-    ++world().writesTried;
-    if (!world().lineTakesBytes) {
+    World &w = world();
+    w.writesTried++;
+    if (!w.lineTakesBytes) {
         errno = EAGAIN;
         return -1;
     }
     const std::string text(static_cast<const char *>(bytes), size);
-    const bool isCommand = std::exchange(world().commandFollows, text == "\xFE");
-    if (!isCommand && !world().commandFollows && world().onText)
-        world().onText(text);
-    for (const char byte : text)
-        world().display.receive(static_cast<unsigned char>(byte));
-    world().sent += text;
-    world().writes.push_back(size);
+    const bool isCommand = std::exchange(w.commandFollows, text == "\xFE");
+    if (!isCommand && !w.commandFollows && w.display.cursorColumn() + static_cast<int>(size) > 40)
+        w.overruns++;
+    w.sent += text;
+    w.writes.push_back(size);
     if (size == 16)
-        world().events.emplace_back("row");
+        w.events.emplace_back("row");
+    for (const char byte : text) {
+        if (w.display.receive(static_cast<unsigned char>(byte)))
+            w.keypad.request(w.unread.empty());
+        if (w.onlooker != nullptr)
+            w.onlooker->look();
+    }
     return static_cast<ssize_t>(size);
 }
 
 int __wrap_poll(pollfd *descriptors, nfds_t count, int timeout) {
-    if (descriptors->fd != panelDescriptor)
-        return __real_poll(descriptors, count, timeout);
-    EXPECT_TRUE(count == 1 && descriptors->events == POLLIN && timeout == 500);
-    if (world().duringPoll) {
-        once(world().duringPoll);
-        errno = EINTR;
-        return -1;
-    }
-    if (world().answers.empty() || world().answers.front().empty()) {
-        if (!world().answers.empty())
-            world().answers.pop_front();
-        world().microseconds += pollTimeout;
-        return 0;
-    }
-    world().microseconds += answerTime;
-    return 1;
+    EXPECT_TRUE(count == 1 && descriptors->fd == panelDescriptor && descriptors->events == POLLIN &&
+                timeout == pollTimeout / 1ms);
+    World &w = world();
+    w.hasSignalled = false;
+    const Micros end = w.now + pollTimeout;
+    w.pass(pollTimeout, true);
+    if (!w.unread.empty())
+        w.pass(std::min(answerTime, end - w.now));
+    if (w.hasSignalled)
+        return interrupted();
+    return !w.unread.empty() && w.now < end ? 1 : 0;
 }
 
 ssize_t __wrap_read(int descriptor, void *buffer, size_t size) {
     if (descriptor != panelDescriptor)
         return __real_read(descriptor, buffer, size);
     EXPECT_EQ(size, 255U);
-    const std::string answer = world().answers.front();
-    world().answers.pop_front();
-    return static_cast<ssize_t>(answer.copy(static_cast<char *>(buffer), size));
+    EXPECT_NE(world().unread, "") << "read without an answer";
+    world().reads++;
+    const std::string answers = std::exchange(world().unread, "");
+    return static_cast<ssize_t>(answers.copy(static_cast<char *>(buffer), size));
 }
 
 int __wrap_usleep(useconds_t duration) {
-    world().microseconds += duration;
-    if (duration != turnPause)
-        world().pauses.push_back(std::to_string(duration / 1'000'000) + " s " + world().shown());
-    once(world().duringPause);
-    return 0;
+    World &w = world();
+    w.hasSignalled = false;
+    if (Micros(duration) != turnPause)
+        w.pauses.push_back({std::to_string(duration / 1000) + " ms", w.shown()});
+    w.pass(Micros(duration));
+    return w.hasSignalled ? interrupted() : 0;
 }
 
 int __wrap_gettimeofday(timeval *now, void *) {
     world().events.emplace_back("clock");
     if (!world().clockWorks)
         return -1;
-    now->tv_sec = world().microseconds / 1'000'000;
-    now->tv_usec = world().microseconds % 1'000'000;
+    now->tv_sec = world().now / 1s;
+    now->tv_usec = (world().now % 1s).count();
     return 0;
 }
 
@@ -197,20 +169,31 @@ int __wrap_system(const char *command) {
         world().settings.emplace_back(command);
     } else {
         world().events.push_back(std::string("start ") + command);
-        world().scripts.push_back(command + (" behind " + world().shown()));
+        world().runs.push_back({command, world().shown()});
     }
     return 0;
 }
 
 FILE *__wrap_popen(const char *command, const char *mode) {
     EXPECT_STREQ(mode, "r");
-    if (!world().shellWorks)
+    World &w = world();
+    if (!w.shellWorks)
         return nullptr;
-    world().events.push_back(std::string("run ") + command);
-    if (startsWith(command, applyScript))
-        world().scripts.push_back(command + (" behind " + world().shown()));
-    once(world().duringCommand);
-    return openContents(world().run(command));
+    w.events.push_back(std::string("run ") + command);
+    const Appliance::Words arguments = scriptArguments(command);
+    if (!arguments.empty())
+        w.runs.push_back({command, w.shown()});
+    if (arguments.empty() || w.appliance.prints.count(command) != 0) {
+        const std::string output = w.appliance.output(command);
+        w.pass(w.commandTime);
+        return openContents(output);
+    }
+    const std::string talk = w.appliance.settings["script"] == "chatters" ? "Reloading\n" : "";
+    for (const Micros end = w.now + w.appliance.scriptTime(arguments); w.now < end;) {
+        w.hasSignalled = false; // which does not end a script
+        w.pass(end - w.now);
+    }
+    return openContents(talk + std::to_string(w.appliance.runScript(arguments)) + "\n");
 }
 
 int __wrap_pclose(FILE *pipe) {
@@ -222,12 +205,13 @@ FILE *fopen64(const char *path, const char *mode) {
     using Open = FILE *(*)(const char *, const char *);
     static const auto realOpen = reinterpret_cast<Open>(dlsym(RTLD_NEXT, "fopen64"));
     const std::string name = path;
-    if (!startsWith(name, "/etc/") && !startsWith(name, "/opt/kestrova/")) {
+    if (isTestsOwn(name))
         return realOpen(path, mode);
-    }
+    EXPECT_EQ(knownFiles().count(name), 1U) << "a file that no appliance knows: " << name;
     world().events.push_back("open " + name);
-    const auto file = world().files.find(name);
-    return file == world().files.end() ? nullptr : openContents(file->second);
+    const auto &files = world().appliance.files;
+    const auto file = files.find(name);
+    return file == files.end() ? nullptr : openContents(file->second);
 }
 
 } // extern "C"

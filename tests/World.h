@@ -1,52 +1,73 @@
-// The world that the program lives in, as the tests have it: an appliance made of plain data, a
-// serial line whose far end is the emulated display, and a clock that moves only when the program
-// waits. It stands in for the POSIX calls that the program makes.
+// The world that the program lives in, as the tests have it: an appliance of plain text, the
+// emulated panel at the far end of the serial line, and a clock that moves only when the program
+// waits or has a command run. It stands in for the POSIX calls that the program makes, and owns
+// every path: what it does not know is a test's failure, never the machine's own.
 #pragma once
 
-#include "emulator/Display.h"
+#include "Appliance.h"
 
-#include <deque>
-#include <functional>
-#include <map>
+#include "emulator/Display.h"
+#include "emulator/Keypad.h"
+
+#include <chrono>
 #include <string>
 #include <vector>
 
+using Micros = std::chrono::microseconds;
+
+/// Somebody who looks at the panel whenever it has taken in a byte or time has passed, and when he
+/// wants to.
+class Onlooker {
+  public:
+    Onlooker() = default;
+    Onlooker(const Onlooker &) = delete;
+    Onlooker &operator=(const Onlooker &) = delete;
+    virtual ~Onlooker() = default;
+
+    virtual void look() = 0;
+    virtual Micros wakeAt() const = 0;
+};
+
 struct World {
-    // The appliance. A file that is not named cannot be opened; a port's address may be empty.
-    std::map<std::string, std::string> files;
-    std::map<std::string, std::string> portAddresses;
-    std::map<std::string, std::string> portMethods;
-    std::string hostname = "monitor\n";
-    std::string scriptOutput = "0\n";
-    std::map<std::string, std::string> outputs; // what these command lines print, whatever the rest
+    Appliance appliance;
     bool shellWorks = true;
     bool clockWorks = true;
     bool lineTakesBytes = true;
 
-    // The line and the clock. Each poll of the panel takes the next answer; "" is silence.
-    std::deque<std::string> answers;
-    std::function<void()> duringPoll, duringPause, duringCommand; // each runs once, then is cleared
-    std::function<void(const std::string &)> onText; // before each write of characters, every time
-    long long microseconds = 1'700'000'000'000'000;
+    emulator::Display display;
+    emulator::Keypad keypad{[this](emulator::Key key) {
+        unread += {'\xFD', static_cast<char>(emulator::traits(key).code)};
+    }};
+    std::string unread;      // answers that the program has not read
+    unsigned long reads = 0; // of answers
+
+    Onlooker *onlooker = nullptr;
+    Micros now{1'700'000'000'000'000};
+    Micros commandTime{0};     // that each command takes but the configuration script
+    bool hasSignalled = false; // which cuts a wait short
 
     // What the program has done.
-    emulator::Display display;
-    std::string sent; // bytes written, and
+    struct Deed {
+        std::string what;   // a command, or how long a pause: "3000 ms"
+        std::string behind; // what the panel showed meanwhile
+    };
+    std::string sent;                // bytes written,
+    std::vector<std::size_t> writes; // the length of each write,
     int writesTried = 0;
-    std::vector<std::size_t> writes;  // the length of each write
-    std::vector<std::string> events;  // "clock", "run COMMAND", "start COMMAND", "open PATH", "row"
-    std::vector<std::string> pauses;  // "3 s ROWS": how long and over which screen; not the loop's
-    std::vector<std::string> scripts; // "COMMAND behind ROWS": the configuration script's runs
-    bool commandFollows = false;      // the last byte was a prefix
+    bool commandFollows = false;     // the last byte was a prefix
+    int overruns = 0;                // writes of characters past a row's end
+    std::vector<Deed> pauses;        // but for the one that ends each turn
+    std::vector<Deed> runs;          // of the configuration script
+    std::vector<std::string> events; // "clock", "run COMMAND", "start COMMAND", "open PATH", "row"
     std::vector<std::string> settings; // the line's, made before `main`
 
     /// Both rows without the blanks at their ends, as "row 0|row 1".
     std::string shown() const;
-    std::string run(const std::string &command);
+    /// The arguments of the events that begin so.
     std::vector<std::string> commands(const std::string &beginning) const;
+    /// Lets this time pass, or, if `forAnswer`, as much of it as goes by before there is one.
+    void pass(Micros time, bool forAnswer = false);
 };
 
 /// The one world. It exists before the first static initialiser that asks for it.
 World &world();
-
-inline const std::string applyScript = "/opt/kestrova/scripts/ezio/apply.py ";
