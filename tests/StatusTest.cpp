@@ -4,6 +4,7 @@
 #include "status/PageTexts.h"
 
 #include <cmath>
+#include <csignal>
 
 using emulator::Key;
 using namespace std::chrono_literals;
@@ -155,4 +156,25 @@ FRESH_TEST(Status, TheServerIsNamedOnlyWhenBothFilesSaySo) {
 FRESH_TEST(Status, AQ75HasTheBannerOfAQ70ButIsAModelOfItsOwn) {
     standardAppliance();
     EXPECT_EQ(detectPlatform(), 1U);
+}
+
+FRESH_TEST(Status, AClockThatIsSetBackStopsTheRotationUntilAKeyOrAReload) {
+    standardAppliance();
+    Operator person;
+    person.poll();
+    world().now -= 1h;
+    person.wait(600);
+    EXPECT_EQ(Operator::sees(), product);
+    person.press(Key::down);
+    person.wait(59);
+    EXPECT_EQ(Operator::sees(), "Hostname:|monitor");
+    person.wait(3);
+    EXPECT_EQ(Operator::sees(), "Connected to:|no server");
+
+    world().now -= 1h;
+    person.wait(600);
+    EXPECT_EQ(Operator::sees(), "Connected to:|no server");
+    raise(SIGUSR1);
+    person.poll();
+    EXPECT_EQ(Operator::sees(), product);
 }
