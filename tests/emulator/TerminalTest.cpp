@@ -12,21 +12,15 @@ namespace {
 // The events as letters: the key's initial, in capitals for a hold; M and m for the mouse, Q, and a
 // full stop for any other character.
 std::string letters(const std::vector<TerminalKeys::Event> &events) {
-    struct Letter {
-        char operator()(const TerminalKeys::Tap &tap) const { return traits(tap.key).letter; }
-        char operator()(const TerminalKeys::Hold &hold) const {
-            return static_cast<char>(std::toupper(traits(hold.key).letter));
-        }
-        char operator()(const TerminalKeys::MouseDown &mouse) const {
-            return mouse.row == 1 && mouse.column == 34 ? 'M' : '?';
-        }
-        char operator()(const TerminalKeys::MouseUp &) const { return 'm'; }
-        char operator()(const TerminalKeys::Quit &) const { return 'Q'; }
-        char operator()(const TerminalKeys::Other &) const { return '.'; }
-    };
     std::string text;
-    for (const auto &event : events)
-        text += std::visit(Letter(), event);
+    for (const auto &event : events) {
+        if (const auto *tap = std::get_if<TerminalKeys::Tap>(&event))
+            text += traits(tap->key).letter;
+        else if (const auto *hold = std::get_if<TerminalKeys::Hold>(&event))
+            text += static_cast<char>(std::toupper(traits(hold->key).letter));
+        else
+            text += "..MmQ."[event.index()];
+    }
     return text;
 }
 
