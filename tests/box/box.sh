@@ -4,6 +4,7 @@ unset PANEL_TTY
 # The box is copied to where everyone may go: an ordinary user may not be able to reach the checkout.
 copy=$(mktemp -d /tmp/box.XXXXXX) || exit 1
 trap 'rm -rf "$copy"' EXIT
+trap 'exit 1' HUP INT TERM
 cp -R "$(dirname "$0")/../../box" "$1" "$copy"
 cp -R "$copy/box/appliance" "$copy/broken"
 chmod -R a+rwX "$copy"

@@ -3,6 +3,7 @@
 cd "$(dirname "$(realpath "$0")")/../.." || exit 1
 taken=$(mktemp -d) || exit 1
 trap 'rm -r "$taken"' EXIT
+trap 'exit 1' HUP INT TERM
 "$1" --journey "$3" --pictures "$taken" -- box/kestrova-panel-box -- "$2" || exit 1
 for picture in "$taken"/*.svg; do
     cmp "$picture" "docs/pictures/${picture##*/}" || {

@@ -3,6 +3,7 @@
 . "$(dirname "$0")/read-only.sh"
 work=$(mktemp -d) || exit 1
 trap 'rm -rf "$work"' EXIT
+trap 'exit 1' HUP INT TERM
 
 # try NAME OPTION...: configures in a folder of its own, quickly rather than well.
 try() {

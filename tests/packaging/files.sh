@@ -3,6 +3,7 @@
 . "$(dirname "$0")/read-only.sh"
 work=$(mktemp -d) || exit 1
 trap 'rm -rf "$work"' EXIT
+trap 'exit 1' HUP INT TERM
 prefix=$work$2
 unit=$prefix/lib/systemd/system/kestrova-panel.service
 

@@ -5,6 +5,7 @@ cd "$(dirname "$(realpath "$0")")/../.." || exit 1
 here=$PWD
 work=$(mktemp -d) || exit 1
 trap 'rm -rf "$work"' EXIT
+trap 'exit 1' HUP INT TERM
 
 # Without their temporary folder they say one line and end: the next thing could be the host's.
 for script in tests/box/box.sh tests/box/journey.sh \
