@@ -4,10 +4,8 @@
 
 #include <arpa/inet.h>
 #include <bitset>
-#include <filesystem>
 #include <fstream>
-#include <iomanip>
-#include <optional>
+#include <functional>
 #include <set>
 #include <sstream>
 #include <stdexcept>
@@ -15,8 +13,6 @@
 using namespace std::chrono_literals;
 
 namespace {
-
-const std::string interfacesFile = "/etc/network/interfaces", serversFile = "/etc/resolv.conf";
 
 // What stands between `before` and `after` in a command line made of just these three.
 std::optional<std::string> between(const std::string &command, const std::string &before,
@@ -28,22 +24,9 @@ std::optional<std::string> between(const std::string &command, const std::string
     return before + name + after == command ? std::optional(name) : std::nullopt;
 }
 
-std::uint32_t number(const std::string &address) {
-    in_addr binary{};
-    if (inet_pton(AF_INET, address.c_str(), &binary) != 1)
-        throw std::invalid_argument(address);
-    return ntohl(binary.s_addr);
-}
-
-void refuseIf(bool isRefused) {
-    if (isRefused)
-        throw std::invalid_argument("refused");
-}
-
-std::uint32_t host(const std::string &address) {
-    const std::uint32_t value = number(address);
-    refuseIf(value == 0 || value >> 24U == 127 || value >> 28U == 14);
-    return value;
+Appliance::Words wordsOf(const std::string &text) {
+    std::istringstream input(text);
+    return {std::istream_iterator<std::string>(input), {}};
 }
 
 Appliance::Words linesOf(const std::string &text) {
@@ -54,40 +37,25 @@ Appliance::Words linesOf(const std::string &text) {
     return lines;
 }
 
-// As the script does: the port's stanza goes to the place of the old one, or to the end.
-std::string withStanza(const std::string &text, const std::string &port,
-                       const std::string &stanza) {
-    std::string result;
-    bool isPlaced = false, isOwn = false;
-    for (const std::string &line : linesOf(text)) {
-        if (startsWith(line, "iface ") || line.empty())
-            isOwn = startsWith(line, "iface " + port + " ");
-        if (isOwn && !std::exchange(isPlaced, true))
-            result += stanza;
-        if (!isOwn)
-            result += line + "\n";
-    }
-    return isPlaced ? result : result + "\nauto " + port + "\n" + stanza;
+// The fact that a verb is about, and what it says of it.
+std::pair<std::string, std::string> factAndValue(const Appliance::Words &words) {
+    const std::set<std::string> oneOfMany = {"port", "file", "server", "prints"};
+    std::string name = words[0], value;
+    std::size_t next = 1;
+    if (oneOfMany.count(name))
+        name += " " + words[next++];
+    for (; next < words.size(); next++)
+        value += (value.empty() ? "" : " ") + words[next];
+    return {name, value};
 }
 
-std::string withServers(const std::string &text, const Appliance::Words &servers) {
-    std::string result;
+// The text without some of its lines, which are asked about in order.
+std::string without(const std::string &text,
+                    const std::function<bool(const std::string &)> &isDropped) {
+    std::string rest;
     for (const std::string &line : linesOf(text))
-        result += startsWith(line, "nameserver") ? "" : line + "\n";
-    for (const std::string &server : servers)
-        result += "nameserver " + server + "\n";
-    return result;
-}
-
-void expectFact(const std::string &what, const std::string &wanted, const std::string &found) {
-    if (wanted != found)
-        throw std::runtime_error(what + " is '" + found + "', not '" + wanted + "'");
-}
-
-std::string contents(const std::filesystem::path &path) {
-    std::ostringstream text;
-    text << std::ifstream(path).rdbuf();
-    return text.str();
+        rest += isDropped(line) ? "" : line + "\n";
+    return rest;
 }
 
 } // namespace
@@ -96,9 +64,10 @@ bool startsWith(const std::string &text, const std::string &beginning) {
     return text.compare(0, beginning.length(), beginning) == 0;
 }
 
-Appliance::Words wordsOf(const std::string &text) {
-    std::istringstream input(text);
-    return {std::istream_iterator<std::string>(input), {}};
+std::string contents(const std::filesystem::path &path) {
+    std::ostringstream text;
+    text << std::ifstream(path, std::ios::binary).rdbuf();
+    return text.str();
 }
 
 Appliance::Words scriptArguments(const std::string &command) {
@@ -112,65 +81,75 @@ Appliance::Words scriptArguments(const std::string &command) {
 Appliance Appliance::delivered() {
     const std::filesystem::path folder = SOURCE "/box/appliance";
     Appliance appliance;
+    appliance.act({"script", "works"});
     for (const std::string part : {"etc", "opt"}) {
         for (const auto &entry : std::filesystem::recursive_directory_iterator(folder / part)) {
             if (entry.is_regular_file())
-                appliance.files["/" + relative(entry.path(), folder).string()] =
-                    contents(entry.path());
+                appliance.act({"file", "/" + relative(entry.path(), folder).string(),
+                               contents(entry.path())});
         }
     }
     for (const std::string &line : linesOf(contents(folder / "links"))) {
         const Words words = wordsOf(line);
         if (words.empty() || words[0][0] == '#')
             continue;
-        appliance.ports[words[0]] = words[1];
+        appliance.act({"port", words[0], words[1]});
         if (words.size() > 3)
-            appliance.servers[words[0]] = words[3];
+            appliance.act({"server", words[0], words[3]});
     }
-    appliance.settings["hostname"] = wordsOf(appliance.files["/etc/hostname"])[0];
+    appliance.act({"hostname", wordsOf(contents(folder / "etc/hostname"))[0]});
     return appliance;
 }
 
 void Appliance::act(const Words &words) {
-    const std::string &verb = words[0];
-    if (verb == "script") {
-        settings["script"] = words[1] + (words.size() > 2 ? " " + words[2] : "");
-    } else if (verb == "port") {
-        ports[words[1]] = words[2];
-        if (words[2] == "gone")
-            ports.erase(words[1]);
-    } else if (verb == "hostname") {
-        settings["hostname"] = words[1];
-        files["/etc/hostname"] = words[1] + "\n";
-    } else if (verb == "file") {
-        files[words[1]] = words[2];
-    } else if (verb == "remove") {
-        files.erase(words[1]);
-    } else if (words[1] == "port") {
-        const auto port = ports.find(words[2]);
-        expectFact("port " + words[2], words[3], port == ports.end() ? "gone" : port->second);
-    } else if (words[1] == "gateway") {
-        expectFact("the default route", words[2] + " " + words[3], settings["gateway"]);
-    } else if (words[1] == "hostname") {
-        expectFact("the host name", words[2], settings["hostname"]);
-        expectFact("/etc/hostname", words[2] + "\n", files["/etc/hostname"]);
+    const auto [name, value] = factAndValue(words);
+    if (name == "has") {
+        lookUp(Words(words.begin() + 1, words.end()));
+    } else if (name == "remove") {
+        facts.erase("file " + value);
+    } else if (words[0] == "port" && value == "gone") {
+        facts.erase(name);
     } else {
-        if (("\n" + files[words[2]] + "\n").find("\n" + words[3] + "\n") == std::string::npos)
-            throw std::runtime_error(words[2] + " holds other lines:\n" + files[words[2]]);
+        facts[name] = value;
+        if (name == "hostname")
+            facts["file /etc/hostname"] = value + "\n";
     }
 }
 
+void Appliance::lookUp(const Words &words) const {
+    const auto [name, wanted] = factAndValue(words);
+    const std::string found = fact(name).value_or("gone");
+    const bool isFound = words[0] == "file"
+                             ? ("\n" + found + "\n").find("\n" + wanted + "\n") != std::string::npos
+                             : found == wanted;
+    if (!isFound)
+        throw std::runtime_error(name + " is '" + found + "', not '" + wanted + "'");
+    if (name == "hostname")
+        lookUp({"file", "/etc/hostname", wanted});
+}
+
+std::optional<std::string> Appliance::fact(const std::string &name) const {
+    const auto found = facts.find(name);
+    return found == facts.end() ? std::nullopt : std::optional(found->second);
+}
+
+Appliance::Words Appliance::ports() const {
+    Words names;
+    for (const auto &[name, value] : facts) {
+        if (startsWith(name, "port "))
+            names.push_back(name.substr(name.find(' ') + 1));
+    }
+    return names;
+}
+
 std::string Appliance::address(const std::string &port) const {
-    const auto found = ports.find(port);
-    return found == ports.end() || found->second == "-"
-               ? ""
-               : found->second.substr(0, found->second.find('/')) + "\n";
+    const std::string found = fact("port " + port).value_or("-");
+    return found == "-" ? "" : found.substr(0, found.find('/')) + "\n";
 }
 
 std::string Appliance::method(const std::string &port) const {
     std::string found;
-    const auto file = files.find(interfacesFile);
-    for (const std::string &line : linesOf(file == files.end() ? "" : file->second)) {
+    for (const std::string &line : linesOf(fact("file /etc/network/interfaces").value_or(""))) {
         const Words words = wordsOf(line);
         if (line.find('#') == std::string::npos &&
             line.find("iface " + port + " ") != std::string::npos)
@@ -180,19 +159,19 @@ std::string Appliance::method(const std::string &port) const {
 }
 
 std::string Appliance::output(const std::string &command) const {
-    if (const auto given = prints.find(command); given != prints.end())
-        return given->second;
+    if (const auto given = fact("prints " + command))
+        return *given;
     if (command == "hostname")
-        return settings.at("hostname") + "\n";
+        return fact("hostname").value() + "\n";
     if (command ==
         "echo \"`ifconfig -s |       sed 1d |       egrep -v 'lo|ani|docker|v|ipsec_|ssl_' |"
         "       awk '{ print $1 } '`\\neth4\\neth5\" |       sort -u | tr '\n' ','") {
         std::set<std::string> names = {"eth4", "eth5"};
-        for (const auto &[name, address] : ports) {
+        std::string joined;
+        for (const std::string &name : ports()) {
             if (name.find('v') == std::string::npos)
                 names.insert(name);
         }
-        std::string joined;
         for (const std::string &name : names)
             joined += name + ",";
         return joined;
@@ -202,7 +181,7 @@ std::string Appliance::output(const std::string &command) const {
         return address(*port);
     if (const auto port = between(command, "ifconfig | grep '", "'")) {
         std::string found;
-        for (const auto &[name, address] : ports)
+        for (const std::string &name : ports())
             found += name.find(*port) == std::string::npos ? "" : name + ": flags=4163<UP>\n";
         return found;
     }
@@ -216,27 +195,21 @@ std::string Appliance::output(const std::string &command) const {
     return "";
 }
 
-std::chrono::milliseconds Appliance::scriptTime(const Words &arguments) const {
-    constexpr auto settingTakes = 300ms, leaseTakes = 2000ms, askingInVainTakes = 6000ms;
-    const Words mode = wordsOf(settings.at("script"));
-    const std::chrono::seconds hang(mode[0] == "hangs" ? std::stoi(mode[1]) : 0);
-    if (mode[0] == "fails" || arguments.size() < 4 || arguments[3] != "--dhcp")
-        return hang + settingTakes;
-    return hang + (servers.count(arguments[2]) ? leaseTakes : askingInVainTakes);
+std::chrono::milliseconds Appliance::scriptTime() const {
+    const Words mode = wordsOf(fact("script").value());
+    return mode[0] == "hangs" ? std::chrono::seconds(std::stoi(mode[1])) : 300ms;
 }
 
-int Appliance::runScript(const Words &arguments) try {
-    constexpr int failed = 1;
-    if (settings["script"] == "fails")
-        return failed;
+int Appliance::runScript(const Words &arguments) {
+    if (fact("script") == "fails")
+        return EXIT_FAILURE;
     if (arguments[0] == "iface")
         return configurePort(arguments);
     act({"hostname", arguments.at(2)});
-    return 0;
-} catch (const std::logic_error &) { // what makes no sense
-    return 2;
+    return EXIT_SUCCESS;
 }
 
+// It leaves the checks of the values to the script proper.
 int Appliance::configurePort(const Words &arguments) {
     const std::string &port = arguments.at(2);
     std::map<std::string, Words> given;
@@ -247,65 +220,35 @@ int Appliance::configurePort(const Words &arguments) {
         else
             given[option].push_back(word);
     }
-    refuseIf(!startsWith(port, "eth") || ports.count(port) == 0);
-    Words names = given["--dns"];
-    for (const std::string &server : names)
-        host(server);
-    const std::string head = "iface " + port + " inet ";
+    const auto dhcpServer = fact("server " + port);
+    if (!fact("port " + port) || (given.count("--dhcp") && !dhcpServer))
+        return EXIT_FAILURE;
+    std::string stanza = "dhcp\n";
     if (given.count("--dhcp")) {
-        if (servers.count(port) == 0)
-            return 1;
-        const std::string server = servers[port].substr(0, servers[port].find('/'));
-        const std::string lease = server.substr(0, server.rfind('.')) + ".100";
-        setPort(port, lease + servers[port].substr(server.length()), head + "dhcp\n");
-        settings["gateway"] = server + " " + port;
-        if (names.empty())
-            names = {server};
+        const std::size_t lastOctet = dhcpServer->rfind('.') + 1;
+        act({"port", port,
+             dhcpServer->substr(0, lastOctet) + "100" + dhcpServer->substr(dhcpServer->find('/'))});
     } else {
         const std::string &address = given["--ipaddress"].at(0), &mask = given["--netmask"].at(0);
-        const std::uint32_t own = host(address), network = number(mask), rest = ~network;
-        refuseIf(network == 0 || (rest & (rest + 1)) != 0);
-        refuseIf(rest > 1 && ((own & rest) == 0 || (own & rest) == rest));
-        std::string stanza =
-            head + "static\n    address " + address + "\n    netmask " + mask + "\n";
-        Words gateway = given["--gateway"];
-        for (const std::string &each : gateway) {
-            refuseIf(((host(each) ^ own) & network) != 0 || host(each) == own);
-            stanza += "    gateway " + each + "\n";
+        const auto prefix = std::bitset<32>(inet_addr(mask.c_str())).count();
+        act({"port", port, address + "/" + std::to_string(prefix)});
+        stanza = "static\n    address " + address + "\n    netmask " + mask + "\n";
+        for (const std::string &gateway : given["--gateway"]) {
+            act({"gateway", gateway, port});
+            stanza += "    gateway " + gateway + "\n";
         }
-        const auto prefix = std::bitset<32>(network).count();
-        setPort(port, address + "/" + std::to_string(prefix), stanza);
-        if (!gateway.empty())
-            settings["gateway"] = gateway[0] + " " + port;
     }
-    files[serversFile] = withServers(files[serversFile], names);
-    return 0;
-}
-
-void Appliance::setPort(const std::string &port, const std::string &address,
-                        const std::string &stanza) {
-    ports[port] = address;
-    if (between(settings["gateway"], "", " " + port))
-        settings["gateway"] = ""; // the route goes with the address that it came through
-    files[interfacesFile] = withStanza(files[interfacesFile], port, stanza);
-}
-
-std::ostream &operator<<(std::ostream &out, const Appliance &appliance) {
-    for (const auto part : Appliance::parts) {
-        out << (appliance.*part).size() << '\n';
-        for (const auto &[name, value] : appliance.*part)
-            out << std::quoted(name) << std::quoted(value) << '\n';
-    }
-    return out;
-}
-
-std::istream &operator>>(std::istream &in, Appliance &appliance) {
-    for (const auto part : Appliance::parts) {
-        (appliance.*part).clear();
-        std::size_t count{};
-        std::string name;
-        for (in >> count; count > 0 && in >> std::quoted(name); count--)
-            in >> std::quoted((appliance.*part)[name]);
-    }
-    return in;
+    const std::string head = "iface " + port + " inet ";
+    std::string &interfaces = facts["file /etc/network/interfaces"];
+    interfaces = without(interfaces, [&, isOld = false](const std::string &line) mutable {
+        if (startsWith(line, "iface ") || line.empty())
+            isOld = startsWith(line, head);
+        return isOld;
+    });
+    interfaces += "\n" + head + stanza;
+    std::string &servers = facts["file /etc/resolv.conf"];
+    servers = without(servers, [](auto &line) { return startsWith(line, "nameserver"); });
+    for (const std::string &server : given["--dns"])
+        servers += "nameserver " + server + "\n";
+    return EXIT_SUCCESS;
 }

@@ -14,8 +14,8 @@ std::string settingsOf(const NetworkConfig &config) {
 }
 
 NetworkConfig loaded(const std::string &interfaces, const std::string &servers) {
-    world().appliance.files = {{"/etc/network/interfaces", interfaces},
-                               {"/etc/resolv.conf", servers}};
+    world().appliance.act({"file", "/etc/network/interfaces", interfaces});
+    world().appliance.act({"file", "/etc/resolv.conf", servers});
     NetworkConfig config("eth1");
     config.load();
     return config;
@@ -50,73 +50,11 @@ FRESH_TEST(Config, AStanzaIsReadAsItStands) {
         EXPECT_EQ(settingsOf(loaded(interfaces, "")), settings) << interfaces;
 }
 
-FRESH_TEST(Config, ServersAreNotReadWithoutTheInterfaces) {
-    const std::string servers = "nameserver 8.8.8.8\nnameserver 0.0.0.0\nnameserver \n"
-                                "# nameserver 1.1.1.1\n nameserver 2.2.2.2\nnameserver\t3.3.3.3\n"
-                                "nameserver  9.9.9.9";
-    EXPECT_EQ(settingsOf(loaded("iface eth1 inet dhcp\n", servers)),
-              "dhcp [] [] [] 8.8.8.8  9.9.9.9");
-    NetworkConfig config = loaded("", servers);
-    EXPECT_EQ(config.getDns(2), "");
-    config.setDns(2, "1.1.1.1");
-    config.removeDns(2);
+FRESH_TEST(Config, AServerThatIsNotThereIsLeftAlone) {
+    NetworkConfig config = loaded("", "nameserver 8.8.8.8\n");
+    EXPECT_EQ(config.getDns(1), "");
+    config.setDns(1, "1.1.1.1");
+    config.removeDns(1);
     config.removeDns(UINT32_MAX);
-    config.addDns("0.0.0.0");
-    config.addDns("");
-    EXPECT_EQ(settingsOf(config), "static [] [] [] 8.8.8.8  9.9.9.9");
-    config.setAddress("10.1.1.1");
-    world().appliance.files.erase("/etc/network/interfaces");
-    config.load();
-    EXPECT_EQ(settingsOf(config), "static [] [] []");
-}
-
-FRESH_TEST(Config, SettingsBecomeACommandLine) {
-    struct Case {
-        bool dhcp;
-        std::string address, netmask, gateway, options, refusal;
-    };
-    const std::string dns = " --dns 8.8.8.8 --dns 1.1.1.1";
-    const std::vector<Case> cases = {
-        {true, "", "", "", " --dhcp" + dns, ""},
-        {true, "10.1.1.1", "255.0.0.0", "10.1.1.2", " --dhcp" + dns, ""},
-        {false, "10.1.1.1", "255.0.0.0", "10.1.1.2",
-         " --ipaddress 10.1.1.1 --netmask 255.0.0.0 --gateway 10.1.1.2" + dns, ""},
-        {false, "10.1.1.1", "255.0.0.0", "0.0.0.0",
-         " --ipaddress 10.1.1.1 --netmask 255.0.0.0" + dns, ""},
-        {false, "$(x) y", "z", "", " --ipaddress $(x) y --netmask z" + dns, ""},
-        {false, "0.0.0.0", "", "", "", "Invalid IP Addr"},
-        {false, "", "255.0.0.0", "", "", "Invalid IP Addr"},
-        {false, "10.1.1.1", "", "", "", "Invalid Netmask"},
-        {false, "10.1.1.1", "0.0.0.0", "", "", "Invalid Netmask"},
-    };
-    for (const auto &test : cases) {
-        NetworkConfig config =
-            loaded("", "nameserver 8.8.8.8\nnameserver 7.7.7.7\nnameserver 1.1.1.1\n");
-        config.setDhcp(test.dhcp);
-        config.setAddress(test.address);
-        config.setNetmask(test.netmask);
-        config.setGateway(test.gateway);
-        config.setDns(1, "0.0.0.0");
-        world().events.clear();
-        std::vector<std::string> expected;
-        if (test.refusal.empty())
-            expected = {applyScript + "iface --name eth1" + test.options + ";echo $?"};
-        for (const std::string &command : expected)
-            world().appliance.prints[command] = "0\n";
-        EXPECT_EQ(config.apply(), test.refusal);
-        EXPECT_EQ(world().commands("run"), expected);
-    }
-    NetworkConfig bare = loaded("iface eth1 inet dhcp\n", "");
-    std::string &output =
-        world().appliance.prints[applyScript + "iface --name eth1 --dhcp;echo $?"];
-    for (const std::string good : {"0\n", "0", "0x"}) {
-        output = good;
-        EXPECT_EQ(bare.apply(), "") << output;
-    }
-    for (const std::string bad : {"1\n", "127\n", "", "note\n0\n", " 0\n"}) {
-        output = bad;
-        EXPECT_EQ(bare.apply(), "Check Logfile") << output;
-    }
-    world().shellWorks = false;
-    EXPECT_EQ(bare.apply(), "Check Logfile");
+    EXPECT_EQ(settingsOf(config), "static [] [] [] 8.8.8.8");
 }

@@ -3,17 +3,10 @@
 #include "Rack.h"
 
 #include <filesystem>
-#include <fstream>
 
 namespace {
 
 const std::filesystem::path source = SOURCE;
-
-std::string contents(const std::filesystem::path &path) {
-    std::ostringstream text;
-    text << std::ifstream(path, std::ios::binary).rdbuf();
-    return text.str();
-}
 
 std::vector<std::filesystem::path> journeys() {
     std::vector<std::filesystem::path> found;

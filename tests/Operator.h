@@ -14,26 +14,13 @@
 /// Returns whether it held; a failure is printed there.
 [[nodiscard]] bool holdsInFreshProgram(const std::function<void()> &check);
 
-/// A test that meets a program which has just been started, whatever has run before it.
-class FreshProgram : public testing::Test {
-  protected:
-    virtual void check() = 0;
-
-  private:
-    void TestBody() final {
-        EXPECT_TRUE(holdsInFreshProgram([this] { check(); })) << "see above";
-    }
-};
-
-/// Defines such a test; its body follows.
+/// Defines a test that meets a program which has just been started; its body follows.
 #define FRESH_TEST(suite, name)                                                                    \
-    class suite##name : public FreshProgram {                                                      \
-        void check() override;                                                                     \
-    };                                                                                             \
-    const auto *const suite##name##Registered =                                                    \
-        testing::RegisterTest(#suite, #name, nullptr, nullptr, __FILE__, __LINE__,                 \
-                              []() -> FreshProgram * { return new suite##name; });                 \
-    void suite##name::check()
+    static void check##suite##name();                                                              \
+    TEST(suite, name) {                                                                            \
+        EXPECT_TRUE(holdsInFreshProgram(check##suite##name)) << "see above";                       \
+    }                                                                                              \
+    static void check##suite##name()
 
 /// An appliance with one port, for tests that count pages.
 void standardAppliance();
@@ -43,14 +30,32 @@ class Operator {
     /// Starts the program on the world as it is now.
     Operator() : loop(new MainLoop(MainMenu::instance, MainMenu::requestRefresh)) {}
 
-    void poll(); ///< one turn without a key
-    void poll(emulator::Key key);
-    void answer(const std::string &bytes);        ///< one turn in which the panel sends just these
-    void hold(emulator::Key key, int polls);      ///< and then release it
-    void press(emulator::Key key, int times = 1); ///< each as short as the keypad can tell
-    void wait(double seconds);                    ///< turns without a key
-
-    static std::string sees() { return world().shown(); }
+    /// One turn without a key, with one, or in which the panel sends just these bytes.
+    void poll() { loop->turn(); }
+    void poll(emulator::Key key) {
+        world().keypad.press(key);
+        loop->turn();
+        world().keypad.release();
+    }
+    void answer(const std::string &bytes) {
+        world().unread += bytes;
+        loop->turn();
+    }
+    /// Holds the key and lets it go in no time, as a garbled answer does.
+    void hold(emulator::Key key, int polls) {
+        for (int k = 0; k < polls; ++k)
+            poll(key);
+        answer("?");
+    }
+    void press(emulator::Key key, int times = 1) {
+        for (int k = 0; k < times; ++k)
+            hold(key, 1);
+    }
+    /// Turns without a key.
+    void wait(std::chrono::seconds time) {
+        for (const Micros end = world().now + time; world().now < end;)
+            poll();
+    }
 
   private:
     MainLoop *loop; // as the program's, it never ends

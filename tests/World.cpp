@@ -7,7 +7,7 @@
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <poll.h>
-#include <set>
+#include <regex>
 #include <sys/mman.h>
 #include <sys/time.h>
 #include <unistd.h>
@@ -24,18 +24,10 @@ namespace {
 constexpr int panelDescriptor = 4242;
 constexpr Micros pollTimeout = 500ms, answerTime = 25ms, turnPause = 100ms;
 
-// What the program may look for, whether or not the appliance has it.
-const std::set<std::string> &knownFiles() {
-    static const std::set<std::string> known = {"/etc/ma-platform", "/etc/network/interfaces",
-                                                "/etc/resolv.conf", "/opt/kestrova/seq.site_conn",
-                                                "/opt/kestrova/config/nis.config"};
-    return known;
-}
-
-bool isTestsOwn(const std::string &path) {
-    const char *byHand = getenv("PANEL_JOURNEY");
-    return startsWith(path, SOURCE "/") || startsWith(path, testing::TempDir()) ||
-           (byHand != nullptr && path == byHand);
+// The program looks for its files there, whether or not the appliance has them.
+bool isAppliances(const std::string &path) {
+    return (startsWith(path, "/etc/") || startsWith(path, "/opt/kestrova/")) &&
+           !startsWith(path, SOURCE "/");
 }
 
 FILE *openContents(const std::string &contents) {
@@ -54,33 +46,14 @@ int interrupted() {
 } // namespace
 
 std::string World::shown() const {
-    const auto withoutBlanksAtEnd = [](std::string row) {
-        row.erase(row.find_last_not_of(' ') + 1);
-        return row;
-    };
-    return withoutBlanksAtEnd(display.visibleRow(0)) + "|" +
-           withoutBlanksAtEnd(display.visibleRow(1));
-}
-
-std::vector<std::string> World::commands(const std::string &beginning) const {
-    std::vector<std::string> found;
-    for (const auto &event : events) {
-        if (startsWith(event, beginning))
-            found.push_back(event.substr(event.find(' ') + 1));
-    }
-    return found;
+    return std::regex_replace(rows(), std::regex(" +(\\||$)"), "$1");
 }
 
 void World::pass(Micros time, bool forAnswer) {
     const Micros end = now + time;
     const auto isOver = [&] { return hasSignalled || (forAnswer && !unread.empty()); };
-    if (onlooker != nullptr)
-        onlooker->look();
-    while (!isOver() && now < end) {
-        now = onlooker == nullptr ? end : std::min(end, onlooker->wakeAt());
-        if (onlooker != nullptr)
-            onlooker->look();
-    }
+    for (look(); !isOver() && now < end; look())
+        now = std::min(end, wakeAt());
 }
 
 // The calls of the program, and of nobody else, are led here by the linker, which gives the names.
@@ -116,8 +89,7 @@ ssize_t __wrap_write(int descriptor, const void *bytes, size_t size) {
     for (const char byte : text) {
         if (w.display.receive(static_cast<unsigned char>(byte)))
             w.keypad.request(w.unread.empty());
-        if (w.onlooker != nullptr)
-            w.onlooker->look();
+        w.look();
     }
     return static_cast<ssize_t>(size);
 }
@@ -150,7 +122,7 @@ int __wrap_usleep(useconds_t duration) {
     World &w = world();
     w.hasSignalled = false;
     if (Micros(duration) != turnPause)
-        w.pauses.push_back({std::to_string(duration / 1000) + " ms", w.shown()});
+        w.pauses.push_back({std::to_string(duration / 1000) + " ms", w.rows()});
     w.pass(Micros(duration));
     return w.hasSignalled ? interrupted() : 0;
 }
@@ -169,7 +141,7 @@ int __wrap_system(const char *command) {
         world().settings.emplace_back(command);
     } else {
         world().events.push_back(std::string("start ") + command);
-        world().runs.push_back({command, world().shown()});
+        world().runs.push_back({command, world().rows()});
     }
     return 0;
 }
@@ -182,14 +154,14 @@ FILE *__wrap_popen(const char *command, const char *mode) {
     w.events.push_back(std::string("run ") + command);
     const Appliance::Words arguments = scriptArguments(command);
     if (!arguments.empty())
-        w.runs.push_back({command, w.shown()});
-    if (arguments.empty() || w.appliance.prints.count(command) != 0) {
+        w.runs.push_back({command, w.rows()});
+    if (arguments.empty() || w.appliance.fact(std::string("prints ") + command)) {
         const std::string output = w.appliance.output(command);
         w.pass(w.commandTime);
         return openContents(output);
     }
-    const std::string talk = w.appliance.settings["script"] == "chatters" ? "Reloading\n" : "";
-    for (const Micros end = w.now + w.appliance.scriptTime(arguments); w.now < end;) {
+    const std::string talk = w.appliance.fact("script") == "chatters" ? "Reloading\n" : "";
+    for (const Micros end = w.now + w.appliance.scriptTime(); w.now < end;) {
         w.hasSignalled = false; // which does not end a script
         w.pass(end - w.now);
     }
@@ -205,13 +177,11 @@ FILE *fopen64(const char *path, const char *mode) {
     using Open = FILE *(*)(const char *, const char *);
     static const auto realOpen = reinterpret_cast<Open>(dlsym(RTLD_NEXT, "fopen64"));
     const std::string name = path;
-    if (isTestsOwn(name))
+    if (!isAppliances(name))
         return realOpen(path, mode);
-    EXPECT_EQ(knownFiles().count(name), 1U) << "a file that no appliance knows: " << name;
     world().events.push_back("open " + name);
-    const auto &files = world().appliance.files;
-    const auto file = files.find(name);
-    return file == files.end() ? nullptr : openContents(file->second);
+    const auto file = world().appliance.fact("file " + name);
+    return file ? openContents(*file) : nullptr;
 }
 
 } // extern "C"

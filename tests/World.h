@@ -1,7 +1,7 @@
 // The world that the program lives in, as the tests have it: an appliance of plain text, the
 // emulated panel at the far end of the serial line, and a clock that moves only when the program
 // waits or has a command run. It stands in for the POSIX calls that the program makes, and owns
-// every path: what it does not know is a test's failure, never the machine's own.
+// every path of the program: a file that it does not have is missing, never the machine's own.
 #pragma once
 
 #include "Appliance.h"
@@ -10,23 +10,11 @@
 #include "emulator/Keypad.h"
 
 #include <chrono>
+#include <functional>
 #include <string>
 #include <vector>
 
 using Micros = std::chrono::microseconds;
-
-/// Somebody who looks at the panel whenever it has taken in a byte or time has passed, and when he
-/// wants to.
-class Onlooker {
-  public:
-    Onlooker() = default;
-    Onlooker(const Onlooker &) = delete;
-    Onlooker &operator=(const Onlooker &) = delete;
-    virtual ~Onlooker() = default;
-
-    virtual void look() = 0;
-    virtual Micros wakeAt() const = 0;
-};
 
 struct World {
     Appliance appliance;
@@ -41,7 +29,10 @@ struct World {
     std::string unread;      // answers that the program has not read
     unsigned long reads = 0; // of answers
 
-    Onlooker *onlooker = nullptr;
+    /// Somebody looks at the panel whenever it has taken in a byte or time has passed, and when he
+    /// wants to.
+    std::function<void()> look = [] {};
+    std::function<Micros()> wakeAt = [] { return Micros::max(); };
     Micros now{1'700'000'000'000'000};
     Micros commandTime{0};     // that each command takes but the configuration script
     bool hasSignalled = false; // which cuts a wait short
@@ -61,10 +52,9 @@ struct World {
     std::vector<std::string> events; // "clock", "run COMMAND", "start COMMAND", "open PATH", "row"
     std::vector<std::string> settings; // the line's, made before `main`
 
-    /// Both rows without the blanks at their ends, as "row 0|row 1".
+    /// Both rows as "row 0|row 1", and without the blanks at their ends.
+    std::string rows() const { return display.visibleRow(0) + "|" + display.visibleRow(1); }
     std::string shown() const;
-    /// The arguments of the events that begin so.
-    std::vector<std::string> commands(const std::string &beginning) const;
     /// Lets this time pass, or, if `forAnswer`, as much of it as goes by before there is one.
     void pass(Micros time, bool forAnswer = false);
 };
