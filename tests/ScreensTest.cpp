@@ -1,6 +1,5 @@
 #include "Operator.h"
 
-#include "editors/IfaceStaticEditIPMenu.h"
 #include "netconfig/RestartNetworkingMenu.h"
 #include "runtime/MenuContext.h"
 
@@ -43,18 +42,6 @@ FRESH_TEST(Screens, TheRestartIsWaitedForUntilAKeyComes) {
         context.display();
         EXPECT_NE(world().shown(), "Restarting|Networking");
     }
-}
-
-FRESH_TEST(Screens, AnEditorWithoutSettingsDoesNothing) {
-    auto *screen = IfaceStaticEditIPMenu::instance();
-    MenuContext context(screen);
-    world().sent.clear();
-    context.display();
-    EXPECT_EQ(world().sent, "");
-    for (int octet = 0; octet < 4; ++octet)
-        context.onEnter();
-    context.display();
-    EXPECT_EQ(world().shown(), "> Set IP Addr|  Set Netmask  v");
 }
 
 FRESH_TEST(Screens, EnterOnAPortComputesThePageBeforeIt) {
