@@ -49,8 +49,9 @@ void endWith(pid_t parent) {
     _exit(cannotRun);
 }
 
-// Waits until the command and its group have ended; SIGTERM makes it end them, as far as it can:
-// who has become root cannot be killed, and a zombie whose parent has left the group stays.
+// Waits until the command and its group have ended; SIGTERM makes it end them, as far as it can: a
+// process that has become root cannot be killed, and a zombie whose parent has left the group
+// stays.
 int waitForGroup(pid_t command, const sigset_t &awaited) {
     std::optional<int> status;
     std::optional<TimePoint> giveUp;

@@ -47,7 +47,7 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
     : loop([this] { turn(); }), line(options.fast, options.trace),
       keypad([this](Key key) { line.answer(traits(key).code); }),
       arrivals(loop, line.descriptor(), [] {}), output(loop), lastTurn(Clock::now()) {
-    loop.onSignals({SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGCONT, SIGWINCH},
+    loop.onSignals({SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGTSTP, SIGWINCH},
                    [this](int number) { handleSignal(number); });
     setenv("PANEL_TTY", line.path().c_str(), 1);
     FileDescriptor commandOutput;
@@ -57,13 +57,17 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
         journeyOperator =
             add<JourneyOperator>(loop, std::move(*journey), JourneyPlayer::Panel{display, keypad},
                                  std::cout, options.limit, options.pictures);
-    if (options.record)
-        recorder = add<Recorder>(*options.record, display, keypad);
     if (isDrawn) {
         commandOutput = output.open();
         front = add<TerminalFront>(loop, display, keypad,
                                    journeyOperator != nullptr ? TerminalFront::Use::watch
                                                               : TerminalFront::Use::operate);
+    }
+    // After all that may refuse: an older recording is not given up for nothing. It looks before
+    // anybody presses the next key.
+    if (options.record) {
+        recorder = add<Recorder>(*options.record, display, keypad);
+        std::rotate(operators.begin(), operators.end() - 1, operators.end());
     }
     command = std::make_unique<ChildProcess>(loop, withPath(options.command, line.path()),
                                              commandOutput.get());
@@ -90,7 +94,13 @@ int Emulator::run() {
         turn();
         loop.run();
     }
-    report();
+    try {
+        report();
+    } catch (const std::runtime_error &error) {
+        if (!failure)
+            throw;
+        std::cerr << "panel-emulator: " << error.what() << '\n';
+    }
     if (failure)
         std::rethrow_exception(failure);
     return *result;
@@ -100,7 +110,10 @@ void Emulator::handleSignal(int number) {
     if (number == SIGWINCH) {
         if (front != nullptr)
             front->resize();
-    } else if (number != SIGCONT) { // which a turn notices by itself: it comes late
+    } else if (number == SIGTSTP) {
+        const auto stop = [] { raise(SIGSTOP); };
+        front != nullptr ? front->stopWith(stop) : stop();
+    } else if (!result) {
         finish(signalStatus + number);
     }
 }

@@ -21,7 +21,7 @@ std::optional<int> LiveSurroundings::status() {
 }
 
 std::string LiveSurroundings::act(const TestAction &) {
-    return "this can be played in tests only"; // and so is refused when the journey is read
+    return "this can be played in tests only"; // never: such a step is refused when it is read
 }
 
 } // namespace emulator

@@ -36,12 +36,12 @@ constexpr std::array optionKinds{
                [](Options &options, const char *value) { options.record = value; }},
     OptionKind{"pictures", "DIR", "also write each picture of the journey to DIR/NAME.svg",
                [](Options &options, const char *value) { options.pictures = value; }},
-    OptionKind{
-        "limit", "SECONDS", "how long a step of the journey waits for the panel (default 10)",
-        [](Options &options, const char *value) {
-            options.limit =
-                seconds(parseNumber(value, shortestLimit, longestLimit, "a number of seconds"));
-        }},
+    OptionKind{"limit", "SECONDS",
+               "how long a step of the journey waits for the panel (default 10)",
+               [](Options &options, const char *value) {
+                   options.limit = seconds(parseNumber(value, shortestLimit, longestLimit,
+                                                       "a number of seconds for --limit"));
+               }},
     OptionKind{"fast", nullptr, "show bytes as they come instead of at 2400 baud",
                [](Options &options, const char *) { options.fast = true; }},
     OptionKind{"trace", "FILE",

@@ -15,7 +15,8 @@ std::string withoutBlanksAtEnd(std::string text) {
     return text;
 }
 
-// What a journey says of the display; nothing where it cannot, as of a letter that is no ASCII.
+// What a journey says of the display; nothing where it cannot, such as
+// of a character outside ASCII.
 std::string stepsThatExpect(const Display &display) {
     const std::string row0 = display.visibleRow(0), row1 = display.visibleRow(1);
     if (!std::all_of(row0.begin(), row0.end(), isPrintable) ||
@@ -85,6 +86,7 @@ void Recorder::writeStroke(bool isReleased) {
 }
 
 void Recorder::finish() {
+    countAnswers(); // the last may have come after the last look
     if (held)
         writeStroke(true);
     file << sight;

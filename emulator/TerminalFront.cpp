@@ -10,8 +10,12 @@
 #include <cerrno>
 #include <clocale>
 #include <cstdio>
+#include <fcntl.h>
+#include <poll.h>
+#include <stdexcept>
 #include <string>
 #include <sys/ioctl.h>
+#include <termios.h>
 #include <unistd.h>
 
 namespace emulator {
@@ -74,6 +78,29 @@ void frame(Cell at, Cell size) {
     delwin(window);
 }
 
+FileDescriptor openKeyboard() {
+    const char *name = ttyname(STDIN_FILENO);
+    FileDescriptor keyboard(name == nullptr ? -1 : open(name, O_RDONLY | O_NOCTTY | O_CLOEXEC));
+    if (keyboard.get() < 0)
+        throw std::runtime_error("the terminal cannot be opened");
+    return keyboard;
+}
+
+// Ctrl-S is a key like any other here: a terminal that is stopped would stop the panel.
+void ignoreFlowControl() {
+    termios settings{};
+    tcgetattr(STDIN_FILENO, &settings);
+    settings.c_iflag &= ~static_cast<tcflag_t>(IXON);
+    tcsetattr(STDIN_FILENO, TCSANOW, &settings);
+    def_prog_mode();
+}
+
+// A terminal that nobody reads takes nothing more, and writing would wait for it.
+bool isWritable() {
+    pollfd terminal{STDOUT_FILENO, POLLOUT, 0};
+    return poll(&terminal, 1, 0) == 1 && (terminal.revents & POLLOUT) != 0;
+}
+
 void send(const char *sequence) {
     std::fputs(sequence, stdout);
     std::fflush(stdout);
@@ -82,14 +109,15 @@ void send(const char *sequence) {
 } // namespace
 
 TerminalFront::TerminalFront(Loop &loop, const Display &itsDisplay, Keypad &itsKeypad, Use itsUse)
-    : display(itsDisplay), keypad(itsKeypad), use(itsUse),
-      input(loop, STDIN_FILENO, [this] { readInput(); }), finger(itsKeypad),
+    : keyboard(openKeyboard()), display(itsDisplay), keypad(itsKeypad), use(itsUse),
+      input(loop, keyboard.get(), [this] { readInput(); }), finger(itsKeypad),
       countedSince(Clock::now()) {
     std::setlocale(LC_ALL, "");
     initscr();
     cbreak();
     noecho();
     nonl();
+    ignoreFlowControl();
     curs_set(0);
     if (has_colors()) {
         start_color();
@@ -101,6 +129,8 @@ TerminalFront::TerminalFront(Loop &loop, const Display &itsDisplay, Keypad &itsK
 }
 
 TerminalFront::~TerminalFront() {
+    if (!isWritable())
+        tcflush(STDOUT_FILENO, TCOFLUSH); // what nobody reads would hold up the end
     if (use == Use::operate)
         send(mouseOff);
     endwin();
@@ -113,7 +143,9 @@ std::optional<int> TerminalFront::look(TimePoint now) {
         litUntil.at(index(*down)) = now + leastLit;
     if (now >= drawAgain)
         draw(now);
-    return isOver ? std::optional<int>(EXIT_SUCCESS) : std::nullopt;
+    if (isGone && use == Use::watch)
+        throw std::runtime_error("the terminal has gone away");
+    return isOver || isGone ? std::optional<int>(EXIT_SUCCESS) : std::nullopt;
 }
 
 std::optional<TimePoint> TerminalFront::wakeAt() const {
@@ -132,13 +164,13 @@ void TerminalFront::resize() {
 
 void TerminalFront::readInput() {
     std::array<char, 256> bytes{};
-    const ssize_t count = read(STDIN_FILENO, bytes.data(), bytes.size());
+    const ssize_t count = read(keyboard.get(), bytes.data(), bytes.size());
     if (count < 0 && (errno == EINTR || errno == EAGAIN))
         return;
     // A terminal that has gone away reads as its end, or fails.
     if (count <= 0) {
         input.pause(true);
-        isOver = true;
+        isGone = true;
         return;
     }
     const TimePoint now = Clock::now();
@@ -188,7 +220,20 @@ void TerminalFront::carried(unsigned char byte) {
     counted++;
 }
 
+void TerminalFront::stopWith(const std::function<void()> &stop) {
+    if (use == Use::operate)
+        send(mouseOff);
+    endwin();
+    stop();
+    if (use == Use::operate)
+        send(mouseOn);
+    drawAgain = {};
+}
+
 void TerminalFront::draw(TimePoint now) {
+    drawAgain = now + frameTime;
+    if (!isWritable())
+        return;
     erase();
     attrset(A_NORMAL);
     frame(panelAt, panelSize);
@@ -200,7 +245,6 @@ void TerminalFront::draw(TimePoint now) {
         use == Use::operate ? "arrows, Enter, Escape: tap   with Shift, or u d e x: hold   q: quit"
                             : "a journey is being played   q: quit");
     refresh();
-    drawAgain = now + frameTime;
 }
 
 void TerminalFront::drawGlass(TimePoint now) const {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "emulator/Display.h"
+#include "emulator/FileDescriptor.h"
 #include "emulator/Finger.h"
 #include "emulator/Keypad.h"
 #include "emulator/Loop.h"
@@ -10,6 +11,7 @@
 
 #include <array>
 #include <deque>
+#include <functional>
 
 namespace emulator {
 
@@ -30,13 +32,16 @@ class TerminalFront : public Operator {
     TerminalFront &operator=(const TerminalFront &) = delete;
     ~TerminalFront() override;
 
-    /// Ends with status 0 when the operator quits or the terminal goes away.
+    /// Ends with status 0 when the operator quits, and when the terminal of an operator goes away;
+    /// throws std::runtime_error when that of a watcher does.
     std::optional<int> look(TimePoint now) override;
     [[nodiscard]] std::optional<TimePoint> wakeAt() const override;
     void carried(unsigned char byte) override;
 
     /// Draws for the terminal's size as it is now.
     void resize();
+    /// Gives the terminal back while the emulator is stopped, and takes it over again.
+    void stopWith(const std::function<void()> &stop);
 
   private:
     void readInput();
@@ -53,6 +58,9 @@ class TerminalFront : public Operator {
     void drawLine(TimePoint now);
 
     TerminalRescue rescue;
+    // Not standard input itself: the loop reads without blocking, and the shell shares that
+    // setting.
+    FileDescriptor keyboard;
     const Display &display;
     Keypad &keypad;
     Use use;
@@ -60,6 +68,7 @@ class TerminalFront : public Operator {
     TerminalKeys decoder;
     Finger finger;
     bool isOver = false;
+    bool isGone = false; // the terminal
     std::array<TimePoint, keys.size()> litUntil{};
     std::deque<unsigned char> recent;
     unsigned long counted = 0; // bytes since `countedSince`

@@ -45,14 +45,16 @@ bool isFinal(char byte) {
 
 // A mouse report is "[<BUTTON;COLUMN;ROW" and M for down or m for up, counted from 1.
 std::optional<TerminalKeys::Event> mouseEvent(const std::string &text) {
-    int button = 0, column = 0, row = 0;
+    constexpr unsigned modifiers = 0x1C; // Shift, Alt and Ctrl, held with the button
+    unsigned button = 0, column = 0, row = 0;
     char direction = 0;
-    if (std::sscanf(text.c_str(), "[<%d;%d;%d%c", &button, &column, &row, &direction) != 4 ||
-        button != 0)
+    if (std::sscanf(text.c_str(), "[<%5u;%5u;%5u%c", &button, &column, &row, &direction) != 4)
         return std::nullopt;
-    if (direction == 'M')
-        return TerminalKeys::MouseDown{row - 1, column - 1};
-    return TerminalKeys::MouseUp{};
+    if (direction == 'm')
+        return TerminalKeys::MouseUp{};
+    if (direction != 'M' || (button & ~modifiers) != 0 || column == 0 || row == 0)
+        return std::nullopt;
+    return TerminalKeys::MouseDown{static_cast<int>(row) - 1, static_cast<int>(column) - 1};
 }
 
 } // namespace

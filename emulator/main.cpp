@@ -50,7 +50,8 @@ int main(int argc, char **argv) {
         options = emulator::Options::parse(argc, argv);
         if (options.help) {
             std::cout << emulator::Options::helpText() << std::flush;
-            return std::cout ? EXIT_SUCCESS : exitFailed;
+            return std::cout ? EXIT_SUCCESS
+                             : complain(exitFailed, "cannot write to standard output");
         }
         if (options.journey)
             journey = readJourney(*options.journey);

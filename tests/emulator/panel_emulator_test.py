@@ -49,6 +49,7 @@ class Terminal:
 
     def __init__(self, *arguments, kind="xterm", is_controlling=True, command=KEYS):
         self.end, other_end = pty.openpty()
+        self.other_end = os.dup(other_end) if is_controlling else None
         fcntl.ioctl(other_end, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 80, 0, 0))
 
         def take_terminal():
@@ -74,14 +75,16 @@ class Terminal:
         os.write(self.end, keys)
 
     def status(self):
-        """The emulator's, once it has ended; what it says meanwhile is kept."""
+        """The emulator's, once it has ended; what it says until then is kept."""
         give_up = time.monotonic() + 10
-        while self.process.poll() is None and time.monotonic() < give_up:
-            if select.select([self.end], [], [], 0.05)[0]:
-                try:
+        has_ended = False
+        while not has_ended and time.monotonic() < give_up:
+            has_ended = self.process.poll() is not None  # and what it has said is there to be read
+            try:
+                while select.select([self.end], [], [], 0.05)[0]:
                     self.shown += os.read(self.end, 4096)
-                except OSError:
-                    break
+            except OSError:
+                break
         return self.process.wait(timeout=10)
 
 
@@ -183,8 +186,17 @@ class OnTerminal(unittest.TestCase):
             self.assertEqual(terminal.status(), 1)
             self.assertIn(b"check TERM", terminal.shown)
 
+    def test_a_stopped_terminal_does_not_hold_it_up_and_is_given_back_as_it_was(self):
+        terminal = Terminal()
+        terminal.read_until(b"ready")
+        terminal.type(b"\x13")  # Ctrl-S
+        time.sleep(0.5)  # for some frames that cannot be drawn
+        terminal.process.terminate()
+        self.assertEqual(terminal.status(), 128 + signal.SIGTERM)
+        self.assertFalse(fcntl.fcntl(terminal.other_end, fcntl.F_GETFL) & os.O_NONBLOCK)
+
     def test_the_status_and_the_last_words_of_a_command_that_ends_are_shown(self):
-        terminal = Terminal(command="for i in 1 2; do echo noise; done; echo gone; exit 150")
+        terminal = Terminal(command="yes noise | head -n 9; seq 2000; echo gone; exit 150")
         self.assertEqual(terminal.status(), 150)
         last_words = terminal.shown[terminal.shown.index(b"gone"):]
         self.assertIn(b"ended with status 150", last_words)
