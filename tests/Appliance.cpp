@@ -6,7 +6,6 @@
 #include <bitset>
 #include <fstream>
 #include <functional>
-#include <set>
 #include <sstream>
 #include <stdexcept>
 
@@ -17,10 +16,10 @@ namespace {
 // What stands between `before` and `after` in a command line made of just these three.
 std::optional<std::string> between(const std::string &command, const std::string &before,
                                    const std::string &after) {
-    if (!startsWith(command, before) || command.length() < before.length() + after.length())
+    const std::size_t fixed = before.length() + after.length();
+    if (command.length() < fixed)
         return std::nullopt;
-    std::string name =
-        command.substr(before.length(), command.length() - before.length() - after.length());
+    std::string name = command.substr(before.length(), command.length() - fixed);
     return before + name + after == command ? std::optional(name) : std::nullopt;
 }
 
@@ -82,12 +81,10 @@ Appliance Appliance::delivered() {
     const std::filesystem::path folder = SOURCE "/box/appliance";
     Appliance appliance;
     appliance.act({"script", "works"});
-    for (const std::string part : {"etc", "opt"}) {
-        for (const auto &entry : std::filesystem::recursive_directory_iterator(folder / part)) {
-            if (entry.is_regular_file())
-                appliance.act({"file", "/" + relative(entry.path(), folder).string(),
-                               contents(entry.path())});
-        }
+    for (const auto &entry : std::filesystem::recursive_directory_iterator(folder)) {
+        if (entry.is_regular_file())
+            appliance.act(
+                {"file", "/" + relative(entry.path(), folder).string(), contents(entry.path())});
     }
     for (const std::string &line : linesOf(contents(folder / "links"))) {
         const Words words = wordsOf(line);
@@ -119,10 +116,7 @@ void Appliance::act(const Words &words) {
 void Appliance::lookUp(const Words &words) const {
     const auto [name, wanted] = factAndValue(words);
     const std::string found = fact(name).value_or("gone");
-    const bool isFound = words[0] == "file"
-                             ? ("\n" + found + "\n").find("\n" + wanted + "\n") != std::string::npos
-                             : found == wanted;
-    if (!isFound)
+    if (("\n" + found + "\n").find("\n" + wanted + "\n") == std::string::npos)
         throw std::runtime_error(name + " is '" + found + "', not '" + wanted + "'");
     if (name == "hostname")
         lookUp({"file", "/etc/hostname", wanted});
@@ -133,11 +127,11 @@ std::optional<std::string> Appliance::fact(const std::string &name) const {
     return found == facts.end() ? std::nullopt : std::optional(found->second);
 }
 
-Appliance::Words Appliance::ports() const {
-    Words names;
+std::set<std::string> Appliance::ports() const {
+    std::set<std::string> names;
     for (const auto &[name, value] : facts) {
         if (startsWith(name, "port "))
-            names.push_back(name.substr(name.find(' ') + 1));
+            names.insert(name.substr(name.find(' ') + 1));
     }
     return names;
 }
@@ -166,14 +160,11 @@ std::string Appliance::output(const std::string &command) const {
     if (command ==
         "echo \"`ifconfig -s |       sed 1d |       egrep -v 'lo|ani|docker|v|ipsec_|ssl_' |"
         "       awk '{ print $1 } '`\\neth4\\neth5\" |       sort -u | tr '\n' ','") {
-        std::set<std::string> names = {"eth4", "eth5"};
+        std::set<std::string> names = ports();
+        names.insert({"eth4", "eth5"});
         std::string joined;
-        for (const std::string &name : ports()) {
-            if (name.find('v') == std::string::npos)
-                names.insert(name);
-        }
         for (const std::string &name : names)
-            joined += name + ",";
+            joined += name.find('v') == std::string::npos ? name + "," : "";
         return joined;
     }
     if (const auto port =

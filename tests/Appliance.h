@@ -8,6 +8,7 @@
 #include <filesystem>
 #include <map>
 #include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -37,7 +38,7 @@ class Appliance {
 
   private:
     void lookUp(const Words &words) const;
-    Words ports() const;
+    std::set<std::string> ports() const;
     std::string address(const std::string &port) const;
     std::string method(const std::string &port) const;
     int configurePort(const Words &arguments);

@@ -47,10 +47,7 @@ class Operator {
             poll(key);
         answer("?");
     }
-    void press(emulator::Key key, int times = 1) {
-        for (int k = 0; k < times; ++k)
-            hold(key, 1);
-    }
+    void press(emulator::Key key) { hold(key, 1); }
     /// Turns without a key.
     void wait(std::chrono::seconds time) {
         for (const Micros end = world().now + time; world().now < end;)

@@ -1,12 +1,12 @@
 #include "Rack.h"
 
 #include "emulator/FileDescriptor.h"
-#include "emulator/StepTable.h"
 
 #include <csignal>
 #include <filesystem>
 #include <fstream>
 #include <iomanip>
+#include <regex>
 #include <sstream>
 #include <sys/mman.h>
 #include <unistd.h>
@@ -22,13 +22,6 @@ constexpr Micros commandTime = 5ms;
 constexpr Micros longestTurn = 3'700ms;
 constexpr std::size_t hiddenByAWipe = 24; // blanks past the visible columns
 
-std::string withoutKeyRequests(std::string bytes) {
-    const std::string request("\xFE\0\xFE\x06", 4);
-    for (std::size_t at = 0; (at = bytes.find(request, at)) != std::string::npos;)
-        bytes.erase(at, request.length());
-    return bytes;
-}
-
 bool isEditor() {
     const std::string row = world().display.visibleRow(0);
     return startsWith(row, "Enter ") || startsWith(row, "DNS Server Addr:");
@@ -39,31 +32,22 @@ bool isApplyScreen() {
            startsWith(world().display.visibleRow(1), "> Apply Changes");
 }
 
-std::string stepsWithCursor(const Display &display, bool blinking) {
-    return "expect " + emulator::quoted(display.visibleRow(0)) + " " +
-           emulator::quoted(display.visibleRow(1)) + "\nexpect-cursor " +
-           std::to_string(display.cursorRow()) + " " + std::to_string(display.cursorColumn()) +
-           (blinking ? " on\n" : " off\n");
-}
-
-/// What passes from one start of the program to the next, and to whoever started the journey.
+/// What passes from one start of the program to the next.
 struct Passage {
     std::size_t position = 0; // in the journey
     Micros::rep now = world().now.count();
     long long turns = 0;
     bool isOver = false;
     bool isInScene = false;
-    std::string lastSteps;
     Appliance appliance = Appliance::delivered();
 
     void write(std::ostream &out) const {
-        out << position << ' ' << now << ' ' << turns << ' ' << isOver << ' ' << isInScene
-            << std::quoted(lastSteps);
+        out << position << ' ' << now << ' ' << turns << ' ' << isOver << ' ' << isInScene;
         for (const auto &[name, value] : appliance.facts)
             out << std::quoted(name) << std::quoted(value);
     }
     void read(std::istream &in) {
-        in >> position >> now >> turns >> isOver >> isInScene >> std::quoted(lastSteps);
+        in >> position >> now >> turns >> isOver >> isInScene;
         appliance.facts.clear();
         for (std::string name; in >> std::quoted(name);)
             in >> std::quoted(appliance.facts[name]);
@@ -93,7 +77,10 @@ class Rack : public Surroundings {
         player.goTo(passage.position);
         w.commandTime = commandTime;
         w.look = [this] { look(); };
-        w.wakeAt = [this] { return wakeAt(); };
+        w.wakeAt = [&] {
+            const auto wake = std::chrono::ceil<Micros>(player.wakeAt().time_since_epoch());
+            return std::max(w.now, std::min(wake, hostnameScriptEnds));
+        };
         try {
             MainLoop loop(MainMenu::instance, MainMenu::requestRefresh);
             for (;; passage.turns++)
@@ -129,11 +116,6 @@ class Rack : public Surroundings {
         }
         if (w.runs.size() != runsSeen)
             noteRun();
-    }
-
-    Micros wakeAt() const {
-        const auto wake = std::chrono::ceil<Micros>(player.wakeAt().time_since_epoch());
-        return std::max(world().now, std::min(wake, hostnameScriptEnds));
     }
 
     void start(const step::Appliance &appliance) override {
@@ -181,10 +163,7 @@ class Rack : public Surroundings {
     void noteRequest() {
         World &w = world();
         requestsSeen = w.keypad.requests();
-        const bool isCursorWrong = w.display.cursorBlinking() != isEditor();
-        if (isCursorWrong)
-            passage.lastSteps = stepsWithCursor(w.display, isEditor());
-        check(!isCursorWrong, "the cursor blinks just where one edits");
+        check(w.display.cursorBlinking() == isEditor(), "the cursor blinks just where one edits");
         check(w.display.unknownCommands() == 0, "the panel knows no such command");
         check(w.overruns == 0, "a text runs past the end of its row");
         check(w.now - std::min(lastRequest, w.now) <= longestTurn,
@@ -248,7 +227,8 @@ class Rack : public Surroundings {
     }
 
     void begin(const step::ExpectSent &expected) {
-        const std::string sent = withoutKeyRequests(world().sent);
+        const std::regex keyRequest("\xFE\\0\xFE\x06");
+        const std::string sent = std::regex_replace(world().sent, keyRequest, "");
         if (sent != expected.bytes)
             isDone = [sent]() -> bool {
                 throw std::runtime_error("it was " + testing::PrintToString(sent));
@@ -316,7 +296,7 @@ Outcome play(const Journey &journey, bool silently, const std::string &pictures)
         std::ifstream input(file);
         passage.read(input);
     }
-    return {holds, passage.turns, passage.lastSteps};
+    return {holds, passage.turns};
 }
 
 Journey readJourney(const std::string &text, const std::string &name) {

@@ -14,7 +14,6 @@
 struct Outcome {
     bool holds;
     long long turns;
-    std::string lastSteps; ///< what was to be seen instead, as steps, if a journey can say it
 };
 
 /// Plays a journey in virtual time, in a process of its own for the program's each start. What

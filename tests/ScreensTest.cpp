@@ -47,7 +47,8 @@ FRESH_TEST(Screens, TheRestartIsWaitedForUntilAKeyComes) {
 FRESH_TEST(Screens, EnterOnAPortComputesThePageBeforeIt) {
     standardAppliance();
     Operator person;
-    person.press(Key::down, 4); // to the first port
+    for (int page = 0; page < 4; ++page) // to the first port
+        person.press(Key::down);
     world().appliance.act({"file", "/etc/network/interfaces", ""});
     world().events.clear();
     person.poll(Key::enter);

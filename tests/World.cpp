@@ -7,7 +7,6 @@
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <poll.h>
-#include <regex>
 #include <sys/mman.h>
 #include <sys/time.h>
 #include <unistd.h>
@@ -31,11 +30,10 @@ bool isAppliances(const std::string &path) {
 }
 
 FILE *openContents(const std::string &contents) {
-    const int descriptor = memfd_create("contents", 0);
-    if (write(descriptor, contents.data(), contents.length()) < 0)
-        abort();
-    lseek(descriptor, 0, SEEK_SET);
-    return fdopen(descriptor, "r");
+    FILE *file = fdopen(memfd_create("contents", 0), "w+");
+    fwrite(contents.data(), 1, contents.length(), file);
+    rewind(file);
+    return file;
 }
 
 int interrupted() {
@@ -44,10 +42,6 @@ int interrupted() {
 }
 
 } // namespace
-
-std::string World::shown() const {
-    return std::regex_replace(rows(), std::regex(" +(\\||$)"), "$1");
-}
 
 void World::pass(Micros time, bool forAnswer) {
     const Micros end = now + time;
@@ -137,12 +131,9 @@ int __wrap_gettimeofday(timeval *now, void *) {
 }
 
 int __wrap_system(const char *command) {
-    if (startsWith(command, "stty ")) {
-        world().settings.emplace_back(command);
-    } else {
-        world().events.push_back(std::string("start ") + command);
+    world().events.push_back(std::string("start ") + command);
+    if (!startsWith(command, "stty ")) // by which the line is configured
         world().runs.push_back({command, world().rows()});
-    }
     return 0;
 }
 

@@ -11,6 +11,7 @@
 
 #include <chrono>
 #include <functional>
+#include <regex>
 #include <string>
 #include <vector>
 
@@ -50,11 +51,10 @@ struct World {
     std::vector<Deed> pauses;        // but for the one that ends each turn
     std::vector<Deed> runs;          // of the configuration script
     std::vector<std::string> events; // "clock", "run COMMAND", "start COMMAND", "open PATH", "row"
-    std::vector<std::string> settings; // the line's, made before `main`
 
     /// Both rows as "row 0|row 1", and without the blanks at their ends.
     std::string rows() const { return display.visibleRow(0) + "|" + display.visibleRow(1); }
-    std::string shown() const;
+    std::string shown() const { return std::regex_replace(rows(), std::regex(" +(\\||$)"), "$1"); }
     /// Lets this time pass, or, if `forAnswer`, as much of it as goes by before there is one.
     void pass(Micros time, bool forAnswer = false);
 };
