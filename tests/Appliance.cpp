@@ -59,10 +59,6 @@ std::string without(const std::string &text,
 
 } // namespace
 
-bool startsWith(const std::string &text, const std::string &beginning) {
-    return text.compare(0, beginning.length(), beginning) == 0;
-}
-
 std::string contents(const std::filesystem::path &path) {
     std::ostringstream text;
     text << std::ifstream(path, std::ios::binary).rdbuf();
@@ -130,7 +126,7 @@ std::optional<std::string> Appliance::fact(const std::string &name) const {
 std::set<std::string> Appliance::ports() const {
     std::set<std::string> names;
     for (const auto &[name, value] : facts) {
-        if (startsWith(name, "port "))
+        if (boost::starts_with(name, "port "))
             names.insert(name.substr(name.find(' ') + 1));
     }
     return names;
@@ -206,7 +202,7 @@ int Appliance::configurePort(const Words &arguments) {
     std::map<std::string, Words> given;
     std::string option;
     for (const std::string &word : Words(arguments.begin() + 3, arguments.end())) {
-        if (startsWith(word, "--"))
+        if (boost::starts_with(word, "--"))
             given[option = word];
         else
             given[option].push_back(word);
@@ -232,13 +228,13 @@ int Appliance::configurePort(const Words &arguments) {
     const std::string head = "iface " + port + " inet ";
     std::string &interfaces = facts["file /etc/network/interfaces"];
     interfaces = without(interfaces, [&, isOld = false](const std::string &line) mutable {
-        if (startsWith(line, "iface ") || line.empty())
-            isOld = startsWith(line, head);
+        if (boost::starts_with(line, "iface ") || line.empty())
+            isOld = boost::starts_with(line, head);
         return isOld;
     });
     interfaces += "\n" + head + stanza;
     std::string &servers = facts["file /etc/resolv.conf"];
-    servers = without(servers, [](auto &line) { return startsWith(line, "nameserver"); });
+    servers = without(servers, [](auto &line) { return boost::starts_with(line, "nameserver"); });
     for (const std::string &server : given["--dns"])
         servers += "nameserver " + server + "\n";
     return EXIT_SUCCESS;

@@ -4,6 +4,8 @@
 // `prints COMMAND OUTPUT`, what this command line prints whatever the rest.
 #pragma once
 
+#include <boost/algorithm/string/predicate.hpp>
+
 #include <chrono>
 #include <filesystem>
 #include <map>
@@ -48,5 +50,4 @@ inline const std::string applyScript = "/opt/kestrova/scripts/ezio/apply.py ";
 
 /// The configuration script's arguments in this command line; none where it is another command.
 Appliance::Words scriptArguments(const std::string &command);
-bool startsWith(const std::string &text, const std::string &beginning);
 std::string contents(const std::filesystem::path &path);

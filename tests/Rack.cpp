@@ -2,6 +2,8 @@
 
 #include "emulator/FileDescriptor.h"
 
+#include <boost/algorithm/string/erase.hpp>
+
 #include <csignal>
 #include <filesystem>
 #include <fstream>
@@ -23,12 +25,12 @@ constexpr std::size_t hiddenByAWipe = 24; // blanks past the visible columns
 
 bool isEditor() {
     const std::string row = world().display.visibleRow(0);
-    return startsWith(row, "Enter ") || startsWith(row, "DNS Server Addr:");
+    return boost::starts_with(row, "Enter ") || boost::starts_with(row, "DNS Server Addr:");
 }
 
 bool isApplyScreen() {
-    return startsWith(world().rows(), "ESC   - Cancel") ||
-           startsWith(world().display.visibleRow(1), "> Apply Changes");
+    return boost::starts_with(world().rows(), "ESC   - Cancel") ||
+           boost::starts_with(world().display.visibleRow(1), "> Apply Changes");
 }
 
 /// What passes from one start of the program to the next.
@@ -186,7 +188,7 @@ class Rack : public Surroundings {
         lastRequest = Micros::max(); // nobody knows how long the script takes
         runsSeen++;
         const std::string &command = w.runs.back().what;
-        if (startsWith(command, "`")) {
+        if (boost::starts_with(command, "`")) {
             hostnameScript = scriptArguments(command);
             hostnameScriptEnds = w.now + w.appliance.scriptTime();
         }
@@ -227,9 +229,7 @@ class Rack : public Surroundings {
 
     void begin(const step::ExpectSent &expected) {
         const std::string keyRequest("\xFE\0\xFE\x06", 4);
-        std::string sent = world().sent;
-        for (std::size_t at = 0; (at = sent.find(keyRequest, at)) != std::string::npos;)
-            sent.erase(at, keyRequest.length());
+        const std::string sent = boost::erase_all_copy(world().sent, keyRequest);
         if (sent != expected.bytes)
             isDone = [sent]() -> bool {
                 throw std::runtime_error("it was " + testing::PrintToString(sent));

@@ -1,5 +1,7 @@
 #include "World.h"
 
+#include <algorithm>
+#include <array>
 #include <gtest/gtest.h>
 
 #include <cerrno>
@@ -25,8 +27,8 @@ constexpr Micros pollTimeout = 500ms, answerTime = 25ms, turnPause = 100ms;
 
 // The program looks for its files there, whether or not the appliance has them.
 bool isAppliances(const std::string &path) {
-    return (startsWith(path, "/etc/") || startsWith(path, "/opt/kestrova/")) &&
-           !startsWith(path, SOURCE "/");
+    return (boost::starts_with(path, "/etc/") || boost::starts_with(path, "/opt/kestrova/")) &&
+           !boost::starts_with(path, SOURCE "/");
 }
 
 FILE *openContents(const std::string &contents) {
@@ -40,6 +42,10 @@ int interrupted() {
     errno = EINTR;
     return -1;
 }
+
+const std::array<std::string, 5> knownFiles = {"/etc/ma-platform", "/etc/network/interfaces",
+                                               "/etc/resolv.conf", "/opt/kestrova/seq.site_conn",
+                                               "/opt/kestrova/config/nis.config"};
 
 } // namespace
 
@@ -132,7 +138,7 @@ int __wrap_gettimeofday(timeval *now, void *) {
 
 int __wrap_system(const char *command) {
     world().events.push_back(std::string("start ") + command);
-    if (!startsWith(command, "stty ")) // by which the line is configured
+    if (!boost::starts_with(command, "stty ")) // by which the line is configured
         world().runs.push_back({command, world().rows()});
     return 0;
 }
@@ -170,6 +176,8 @@ FILE *fopen64(const char *path, const char *mode) {
     const std::string name = path;
     if (!isAppliances(name))
         return realOpen(path, mode);
+    EXPECT_NE(std::find(knownFiles.begin(), knownFiles.end(), name), knownFiles.end())
+        << "a file that no appliance knows: " << name;
     world().events.push_back("open " + name);
     const auto file = world().appliance.fact("file " + name);
     return file ? openContents(*file) : nullptr;

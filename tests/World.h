@@ -9,9 +9,10 @@
 #include "emulator/Display.h"
 #include "emulator/Keypad.h"
 
+#include <boost/algorithm/string/trim.hpp>
+
 #include <chrono>
 #include <functional>
-#include <regex>
 #include <string>
 #include <vector>
 
@@ -54,7 +55,10 @@ struct World {
 
     /// Both rows as "row 0|row 1", and without the blanks at their ends.
     std::string rows() const { return display.visibleRow(0) + "|" + display.visibleRow(1); }
-    std::string shown() const { return std::regex_replace(rows(), std::regex(" +(\\||$)"), "$1"); }
+    std::string shown() const {
+        return boost::trim_right_copy(display.visibleRow(0)) + "|" +
+               boost::trim_right_copy(display.visibleRow(1));
+    }
     /// Lets this time pass, or, if `forAnswer`, as much of it as goes by before there is one.
     void pass(Micros time, bool forAnswer = false);
 };
