@@ -63,7 +63,9 @@ int Display::cursorColumn() const {
 bool Display::execute(unsigned char command) {
     switch (command) {
     case noOperation:
+        return false;
     case functionSet:
+        functionSets++;
         return false;
     case clearDisplay:
         clear();

@@ -31,12 +31,17 @@ class Display {
     [[nodiscard]] int cursorColumn() const;
     [[nodiscard]] bool cursorBlinking() const { return isBlinking; }
 
+    /// How often a program has opened the panel.
+    [[nodiscard]] unsigned long openings() const { return functionSets / setsPerOpening; }
+
     /// Commands received that this panel does not know; they change nothing else.
     [[nodiscard]] unsigned long unknownCommands() const { return unknownCount; }
     /// Characters received for positions that the glass does not show.
     [[nodiscard]] unsigned long hiddenCharacters() const { return hiddenCount; }
 
   private:
+    static constexpr unsigned long setsPerOpening = 2;
+
     bool execute(unsigned char command);
     void write(unsigned char character);
     void clear();
@@ -45,6 +50,7 @@ class Display {
     int position = 0; // 0 to 79: the address counter without the gap between the rows
     bool commandFollows = false;
     bool isBlinking = false;
+    unsigned long functionSets = 0;
     unsigned long unknownCount = 0;
     unsigned long hiddenCount = 0;
 };

@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <exception>
+#include <initializer_list>
 #include <iostream>
 #include <stdexcept>
 #include <utility>
@@ -16,10 +17,20 @@ namespace {
 constexpr int signalStatus = 128; // and the signal's number
 // The guard needs three at most to end the command, or to give up.
 constexpr std::chrono::seconds commandPatience{4};
+constexpr std::chrono::seconds browserPatience{1};
 // A turn comes at least that often, and one that comes much later does because the emulator was
 // stopped.
 constexpr std::chrono::milliseconds idleTurn{500};
 constexpr std::chrono::milliseconds longestTurn{1000};
+
+// The address has a line of its own: it is there to be taken by other programs, too.
+void announce(const WebServer &server) {
+    std::cout << server.address() << std::endl;
+    if (server.isOpenToOthers())
+        std::cerr << "panel-emulator: other machines can reach this page, by this machine's "
+                     "address: whoever has\nits whole address stands at the panel, and may press "
+                     "its keys; nothing is encrypted\n";
+}
 
 std::vector<std::string> withPath(std::vector<std::string> command, const std::string &path) {
     constexpr std::string_view placeholder = "{tty}";
@@ -51,36 +62,42 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
                    [this](int number) { handleSignal(number); });
     setenv("PANEL_TTY", line.path().c_str(), 1);
     FileDescriptor commandOutput;
-    const bool isDrawn = !journey || options.show;
+    const bool isDrawn = options.show || (!journey && !options.web);
     isJourney = journey.has_value();
+    const Use use = isJourney ? Use::watch : Use::operate;
     if (isJourney)
-        journeyOperator =
-            add<JourneyOperator>(loop, std::move(*journey), JourneyPlayer::Panel{display, keypad},
-                                 std::cout, options.limit, options.pictures);
+        journeyOperator = std::make_unique<JourneyOperator>(
+            loop, std::move(*journey), JourneyPlayer::Panel{display, keypad}, std::cout,
+            options.limit, options.pictures);
+    if (options.web)
+        webFront = std::make_unique<WebFront>(loop, *options.web, display, keypad, use);
     if (isDrawn) {
         commandOutput = output.open();
-        front = add<TerminalFront>(loop, display, keypad,
-                                   journeyOperator != nullptr ? TerminalFront::Use::watch
-                                                              : TerminalFront::Use::operate);
+        front = std::make_unique<TerminalFront>(loop, display, keypad, use);
     }
-    // After all that may refuse: an older recording is not given up for nothing. It looks before
-    // anybody presses the next key.
-    if (options.record) {
-        recorder = add<Recorder>(*options.record, display, keypad);
-        std::rotate(operators.begin(), operators.end() - 1, operators.end());
+    // After all that may refuse: an older recording is not given up for nothing.
+    if (options.record)
+        startRecording(*options.record);
+    // The recorder looks before anybody presses the next key.
+    for (Operator *each : std::initializer_list<Operator *>{recorder.get(), webFront.get(),
+                                                            journeyOperator.get(), front.get()}) {
+        if (each != nullptr)
+            operators.push_back(each);
     }
     command = std::make_unique<ChildProcess>(loop, withPath(options.command, line.path()),
                                              commandOutput.get());
     setenv("PANEL_COMMAND_PID", std::to_string(command->pid()).c_str(), 1);
-    if (journeyOperator != nullptr)
+    if (journeyOperator)
         journeyOperator->setCommand(options.command.front(), command->pid());
+    if (webFront)
+        announce(webFront->webServer());
 }
 
-template <typename Kind, typename... Arguments> Kind *Emulator::add(Arguments &&...arguments) {
-    auto added = std::make_unique<Kind>(std::forward<Arguments>(arguments)...);
-    Kind *borrowed = added.get();
-    operators.push_back(std::move(added));
-    return borrowed;
+void Emulator::startRecording(const std::string &path) {
+    recording.open(path);
+    recorder = std::make_unique<Recorder>(recording, display, keypad);
+    if (!recording)
+        throw std::runtime_error("cannot write " + path);
 }
 
 int Emulator::run() {
@@ -88,9 +105,10 @@ int Emulator::run() {
     try {
         turn();
         loop.run();
-    } catch (const std::runtime_error &) {
+    } catch (const std::runtime_error &error) {
         failure = std::current_exception();
-        finish(EXIT_FAILURE);
+        const std::string message = error.what();
+        finish(EXIT_FAILURE, message.substr(0, message.find('\n')));
         turn();
         loop.run();
     }
@@ -108,20 +126,20 @@ int Emulator::run() {
 
 void Emulator::handleSignal(int number) {
     if (number == SIGWINCH) {
-        if (front != nullptr)
+        if (front)
             front->resize();
     } else if (number == SIGTSTP) {
         const auto stop = [] { raise(SIGSTOP); };
-        front != nullptr ? front->stopWith(stop) : stop();
+        front ? front->stopWith(stop) : stop();
     } else if (!result) {
-        finish(signalStatus + number);
+        finish(signalStatus + number, "ended by a signal (" + std::string(strsignal(number)) + ")");
     }
 }
 
 void Emulator::turn() {
     const TimePoint begin = Clock::now();
     if (begin - lastTurn > longestTurn) {
-        for (const auto &each : operators)
+        for (Operator *each : operators)
             each->excuse(begin - lastTurn);
     }
     lastTurn = begin;
@@ -131,7 +149,7 @@ void Emulator::turn() {
     while (const std::optional<Line::Byte> byte = line.next(now)) {
         if (display.receive(byte->value))
             keypad.request(byte->sinceAnswerRead);
-        for (const auto &each : operators)
+        for (Operator *each : operators)
             each->carried(byte->value);
         // After each byte, so that no state of the panel is missed.
         letOperatorsLook(now);
@@ -143,49 +161,66 @@ void Emulator::turn() {
 
 TimePoint Emulator::nextTurn(TimePoint now) const {
     TimePoint wake = std::min(now + idleTurn, line.wakeAt().value_or(TimePoint::max()));
-    for (const auto &each : operators)
+    for (Operator *each : operators)
         wake = std::min(wake, each->wakeAt().value_or(TimePoint::max()));
     return wake;
 }
 
 void Emulator::letOperatorsLook(TimePoint now) {
-    for (const auto &each : operators) {
+    for (Operator *each : operators) {
         if (result)
             return;
         if (const std::optional<int> status = each->look(now))
-            finish(*status);
+            finish(*status, each == journeyOperator.get() ? "the journey was played to its end"
+                                                          : "the operator has quit");
     }
 }
 
 void Emulator::noticeCommandsEnd() {
     const std::optional<int> status = command->status();
     if (status && !result) {
-        if (journeyOperator != nullptr)
+        if (journeyOperator)
             throw std::runtime_error("the command ended with " + described(*status) +
                                      " before the journey did\nshown:\n" + Picture(display).text());
         hasCommandEndedItself = true;
-        finish(*status);
+        finish(*status, "the program ended with " + described(*status));
     }
     if (!result)
         return;
     dismissOperators();
-    if (status || Clock::now() >= patience)
+    const TimePoint now = Clock::now();
+    const bool isCommandOver = status || now >= patience;
+    const bool isFarewellOver = !webFront || webFront->isIdle() || now >= farewell;
+    if (isCommandOver && isFarewellOver)
         loop.stop();
 }
 
-void Emulator::finish(int exitStatus) {
+void Emulator::finish(int exitStatus, const std::string &itsReason) {
     result = exitStatus;
+    reason = itsReason;
     patience = Clock::now() + commandPatience;
+    farewell = Clock::now() + browserPatience;
     command->end();
 }
 
 // Gives the terminal back, too, before anything is said there.
 void Emulator::dismissOperators() {
-    front = nullptr;
-    journeyOperator = nullptr;
-    const auto all = std::exchange(operators, {});
-    if (recorder != nullptr)
-        std::exchange(recorder, nullptr)->finish();
+    if (operators.empty())
+        return;
+    operators.clear();
+    front.reset();
+    journeyOperator.reset();
+    if (webFront)
+        webFront->finish(reason);
+    if (recorder)
+        closeRecording();
+}
+
+void Emulator::closeRecording() {
+    recorder->finish();
+    recording.close();
+    if (!recording)
+        throw std::runtime_error("cannot write all of the recording");
 }
 
 void Emulator::report() {

@@ -10,7 +10,9 @@
 #include "emulator/Options.h"
 #include "emulator/Recorder.h"
 #include "emulator/TerminalFront.h"
+#include "emulator/WebFront.h"
 
+#include <fstream>
 #include <memory>
 #include <string>
 #include <vector>
@@ -22,7 +24,7 @@ namespace emulator {
 class Emulator {
   public:
     /// Opens the line and starts the command. The journey, if any, has been read by then.
-    /// Throws when the line, the terminal, a file or a process cannot be had.
+    /// Throws when the line, the terminal, the page's address, a file or a process cannot be had.
     Emulator(const Options &options, std::optional<Journey> journey);
 
     /// Runs until the journey or the command ends, the operator quits or a signal comes, and then
@@ -31,14 +33,15 @@ class Emulator {
     int run();
 
   private:
-    template <typename Kind, typename... Arguments> Kind *add(Arguments &&...arguments);
+    void startRecording(const std::string &path);
     void handleSignal(int number);
     void turn();
     [[nodiscard]] TimePoint nextTurn(TimePoint now) const;
     void letOperatorsLook(TimePoint now);
     void noticeCommandsEnd();
-    void finish(int exitStatus);
+    void finish(int exitStatus, const std::string &reason);
     void dismissOperators();
+    void closeRecording();
     void report();
 
     Loop loop;
@@ -47,15 +50,19 @@ class Emulator {
     Keypad keypad;
     Readable arrivals; // on the line
     CommandOutput output;
-    std::vector<std::unique_ptr<Operator>> operators;
-    JourneyOperator *journeyOperator = nullptr;
-    TerminalFront *front = nullptr;
-    Recorder *recorder = nullptr;
+    std::unique_ptr<JourneyOperator> journeyOperator;
+    std::unique_ptr<TerminalFront> front;
+    std::unique_ptr<WebFront> webFront;
+    std::ofstream recording;
+    std::unique_ptr<Recorder> recorder;
+    std::vector<Operator *> operators; // those of the above that there are, until all is over
     std::unique_ptr<ChildProcess> command;
     bool isJourney = false;
     TimePoint lastTurn;
     std::optional<int> result; // the exit status, once all is over
+    std::string reason;        // for it, as the page tells it
     TimePoint patience;        // until when the command's end is waited for then
+    TimePoint farewell;        // until when browsers are told
     bool hasCommandEndedItself = false;
 };
 

@@ -29,6 +29,7 @@ void Keypad::request(bool sinceAnswerRead) {
 void Keypad::answer() {
     if (!isWaiting || !keyDown)
         return;
+    answersInARow = lastKey == *keyDown ? heldPolls() + 1 : 1;
     lastKey = *keyDown;
     isWaiting = false;
     quietRequests = 0;

@@ -36,6 +36,11 @@ class Keypad {
     [[nodiscard]] unsigned long answered() const { return answerCount; }
     /// The key that was answered last; up before the first answer.
     [[nodiscard]] Key lastAnswer() const { return lastKey; }
+    /// How many polls in a row, as the program counts them, were answered with that key; 0 when the
+    /// last one was not.
+    [[nodiscard]] unsigned long heldPolls() const {
+        return quietRequests >= wholePoll ? 0 : answersInARow;
+    }
     /// True when no key is down and, since the last answer was read, a whole poll has gone by
     /// without one: only then does the program take the next answer for a new press.
     [[nodiscard]] bool settled() const { return !keyDown && quietRequests >= wholePoll; }
@@ -53,6 +58,7 @@ class Keypad {
     bool isWaiting = false; // a request is
     unsigned long requestCount = 0;
     unsigned long answerCount = 0;
+    unsigned long answersInARow = 0;
     unsigned long quietRequests = wholePoll;
 };
 

@@ -10,6 +10,7 @@
 #include <functional>
 #include <initializer_list>
 #include <optional>
+#include <utility>
 
 namespace emulator {
 
@@ -31,7 +32,16 @@ class Loop {
     /// Calls `handler` with each of these signals from now on.
     void onSignals(std::initializer_list<int> numbers, std::function<void(int)> handler);
 
+    /// For what waits for more than a descriptor's readability; its handlers are to be made with
+    /// `turnAfter`.
     boost::asio::io_context &asio() { return context; }
+    /// A completion handler that calls `handle`, after which the emulator takes its turn.
+    template <typename Handle> auto turnAfter(Handle handle) {
+        return [this, handle = std::move(handle)](auto &&...results) mutable {
+            handle(std::forward<decltype(results)>(results)...);
+            afterEvent();
+        };
+    }
 
   private:
     friend class Readable;

@@ -6,7 +6,14 @@
 
 namespace emulator {
 
-/// Whoever works the panel or looks at it: a journey, a person at a terminal, a recorder.
+/// What those who sit at a front of the panel may do.
+enum class Use {
+    operate, ///< they press the keys
+    watch,   ///< somebody else does
+};
+
+/// Whoever works the panel or looks at it: a journey, a person at a terminal or in a
+/// browser, a recorder.
 ///
 /// Each has been handed the display and the keypad. The emulator asks it to look whenever the panel
 /// has taken in a byte and whenever anything else has happened.

@@ -16,6 +16,24 @@ namespace {
 constexpr double shortestLimit = 0.001; // seconds
 constexpr double longestLimit = 86'400;
 
+// An IPv6 address stands in brackets.
+boost::asio::ip::tcp::endpoint parseEndpoint(const std::string &text) {
+    constexpr unsigned highestPort = 65'535;
+    const std::size_t colon = text.rfind(':');
+    const bool hasAddress = colon != std::string::npos;
+    std::string address = hasAddress ? text.substr(0, colon) : "127.0.0.1";
+    const bool isBracketed = address.size() > 2 && address.front() == '[' && address.back() == ']';
+    if (isBracketed)
+        address = address.substr(1, address.size() - 2);
+    boost::system::error_code error;
+    const auto parsed = boost::asio::ip::make_address(address, error);
+    if (error || parsed.is_v6() != isBracketed)
+        throw std::invalid_argument("'" + text + "' is not an [ADDRESS:]PORT for --web");
+    return {parsed,
+            static_cast<unsigned short>(parseNumber(hasAddress ? text.substr(colon + 1) : text, 0U,
+                                                    highestPort, "a port for --web"))};
+}
+
 struct OptionKind {
     const char *name;
     const char *value; // what stands for it in the help; null where there is none
@@ -48,6 +66,11 @@ constexpr std::array optionKinds{
                "write a line for each arrival (<) and answer (>) to FILE:\n"
                "monotonic nanoseconds, direction, bytes in hexadecimal",
                [](Options &options, const char *value) { options.trace = value; }},
+    OptionKind{"web", "[ADDRESS:]PORT",
+               "serve the panel as a page for browsers instead of showing it\n"
+               "on the terminal, and print the page's address; without ADDRESS\n"
+               "to this machine alone; PORT 0 takes a free one",
+               [](Options &options, const char *value) { options.web = parseEndpoint(value); }},
     OptionKind{"help", nullptr, "show this text",
                [](Options &options, const char *) { options.help = true; }},
 };

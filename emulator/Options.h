@@ -2,6 +2,8 @@
 
 #include "emulator/Clock.h"
 
+#include <boost/asio/ip/tcp.hpp>
+
 #include <optional>
 #include <string>
 #include <vector>
@@ -17,6 +19,7 @@ struct Options {
     std::optional<std::string> pictures;
     std::optional<std::string> record;
     std::optional<std::string> trace;
+    std::optional<boost::asio::ip::tcp::endpoint> web; ///< where the page is served
     Clock::duration limit = std::chrono::seconds(10);
     std::vector<std::string> command;
 

@@ -4,7 +4,6 @@
 #include "emulator/StepTable.h"
 
 #include <algorithm>
-#include <stdexcept>
 
 namespace emulator {
 
@@ -32,13 +31,11 @@ std::string stepsThatExpect(const Display &display) {
 
 } // namespace
 
-Recorder::Recorder(std::string itsPath, const Display &itsDisplay, const Keypad &itsKeypad)
-    : display(itsDisplay), keypad(itsKeypad), path(std::move(itsPath)), file(path),
-      answersSeen(keypad.answered()), requestsSeen(keypad.requests()) {
+Recorder::Recorder(std::ostream &itsOutput, const Display &itsDisplay, const Keypad &itsKeypad)
+    : display(itsDisplay), keypad(itsKeypad), output(itsOutput), answersSeen(keypad.answered()),
+      requestsSeen(keypad.requests()) {
     // The longest that the program keeps a page is a minute.
-    file << "# Recorded at the panel.\nlimit 90\n" << std::flush;
-    if (!file)
-        throw std::runtime_error("cannot write " + path);
+    output << "# Recorded at the panel.\nlimit 90\n" << std::flush;
 }
 
 std::optional<int> Recorder::look(TimePoint) {
@@ -55,44 +52,45 @@ std::optional<int> Recorder::look(TimePoint) {
 }
 
 void Recorder::countAnswers() {
-    const unsigned long answers = keypad.answered() - answersSeen;
-    if (answers == 0)
+    if (keypad.answered() == answersSeen)
         return;
     answersSeen = keypad.answered();
     const Key key = keypad.lastAnswer();
-    if (held && held->key == key) {
-        held->polls += answers;
-    } else {
+    if (!held || held->key != key) {
         if (held)
             writeStroke(false);
         // While a key is down, the program goes on counting it: nothing can be waited for.
         if (!isKeyDown)
-            file << sight;
-        held = Held{key, answers};
+            output << sight;
     }
+    held = Held{key, keypad.heldPolls()};
     sight.clear(); // what the key has done is not seen before the next request
 }
 
-void Recorder::writeStroke(bool isReleased) {
+std::string Recorder::stroke(bool isReleased) const {
+    if (!held)
+        return "";
     const std::string name(traits(held->key).name);
     // A tap's one poll could not be told from those of a key that is still down.
     if (held->polls == 1 && isReleased && !isKeyDown)
-        file << "tap " << name << "\n";
-    else
-        file << "hold " << name << " " << held->polls << "\n" << (isReleased ? "release\n" : "");
-    file << std::flush;
+        return "tap " + name + "\n";
+    return "hold " + name + " " + std::to_string(held->polls) + "\n" +
+           (isReleased ? "release\n" : "");
+}
+
+void Recorder::writeStroke(bool isReleased) {
+    output << stroke(isReleased) << std::flush;
     isKeyDown = !isReleased;
     held.reset();
 }
 
+std::string Recorder::end() const {
+    return stroke(true) + sight;
+}
+
 void Recorder::finish() {
     countAnswers(); // the last may have come after the last look
-    if (held)
-        writeStroke(true);
-    file << sight;
-    file.close();
-    if (!file)
-        throw std::runtime_error("cannot write " + path);
+    output << end() << std::flush;
 }
 
 } // namespace emulator

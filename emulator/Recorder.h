@@ -4,24 +4,27 @@
 #include "emulator/Keypad.h"
 #include "emulator/Operator.h"
 
-#include <fstream>
 #include <optional>
+#include <ostream>
 #include <string>
 
 namespace emulator {
 
 /// Writes what is done at the panel as a journey: each key as the program has counted it, and in
 /// front of it what the panel showed when the key was pressed. The journey can be played at any
-/// time, since each step waits until the panel shows the same again.
+/// time, since each step waits until the panel shows the same again. Each step is a line, and what
+/// has been written stays.
 class Recorder : public Operator {
   public:
-    /// Throws std::runtime_error when the file cannot be written.
-    Recorder(std::string path, const Display &display, const Keypad &keypad);
+    /// Writes to `output` from now on.
+    Recorder(std::ostream &output, const Display &display, const Keypad &keypad);
 
     std::optional<int> look(TimePoint now) override;
-    /// Writes what the panel shows at the end. Throws std::runtime_error when not everything could
-    /// be written.
+    /// Writes the end, if it is to end now.
     void finish();
+    /// The steps that would be the end if it were now: the key that is being counted, and what the
+    /// panel shows.
+    [[nodiscard]] std::string end() const;
 
   private:
     struct Held {
@@ -30,12 +33,12 @@ class Recorder : public Operator {
     };
 
     void countAnswers();
+    [[nodiscard]] std::string stroke(bool isReleased) const;
     void writeStroke(bool isReleased);
 
     const Display &display;
     const Keypad &keypad;
-    std::string path;
-    std::ofstream file;
+    std::ostream &output;
     unsigned long answersSeen;
     unsigned long requestsSeen;
     std::optional<Held> held;

@@ -25,9 +25,6 @@ namespace {
 constexpr std::chrono::milliseconds frameTime{100};
 constexpr std::chrono::milliseconds blinkTime{400};
 constexpr std::chrono::milliseconds leastLit{200}; // a tap may well be answered at once
-constexpr std::chrono::seconds rateTime{1};
-constexpr std::size_t recentBytes = 12;
-constexpr double lineBytesPerSecond = 2400.0 / 11;
 
 constexpr short glassColours = 1;
 
@@ -110,8 +107,7 @@ void send(const char *sequence) {
 
 TerminalFront::TerminalFront(Loop &loop, const Display &itsDisplay, Keypad &itsKeypad, Use itsUse)
     : keyboard(openKeyboard()), display(itsDisplay), keypad(itsKeypad), use(itsUse),
-      input(loop, keyboard.get(), [this] { readInput(); }), finger(itsKeypad),
-      countedSince(Clock::now()) {
+      input(loop, keyboard.get(), [this] { readInput(); }), finger(itsKeypad), load(Clock::now()) {
     std::setlocale(LC_ALL, "");
     initscr();
     cbreak();
@@ -213,13 +209,6 @@ void TerminalFront::act(const TerminalKeys::Other &, TimePoint) {
     finger.letGo();
 }
 
-void TerminalFront::carried(unsigned char byte) {
-    recent.push_back(byte);
-    if (recent.size() > recentBytes)
-        recent.pop_front();
-    counted++;
-}
-
 void TerminalFront::stopWith(const std::function<void()> &stop) {
     if (use == Use::operate)
         send(mouseOff);
@@ -271,21 +260,12 @@ void TerminalFront::drawKeys(TimePoint now) {
 }
 
 void TerminalFront::drawLine(TimePoint now) {
-    const std::chrono::duration<double> time = now - countedSince;
-    if (time >= rateTime) {
-        bytesPerSecond = static_cast<double>(counted) / time.count();
-        counted = 0;
-        countedSince = now;
-    }
+    load.look(now);
     std::array<char, 64> rate{};
-    std::string bytes;
-    for (const unsigned char byte : recent) {
-        std::snprintf(rate.data(), rate.size(), "%02X ", static_cast<unsigned>(byte));
-        bytes += rate.data();
-    }
-    bytes.resize(3 * recentBytes, ' ');
-    std::snprintf(rate.data(), rate.size(), "%4.0f bytes/s %4.0f %% of the line", bytesPerSecond,
-                  100 * bytesPerSecond / lineBytesPerSecond);
+    std::snprintf(rate.data(), rate.size(), "%4.0f bytes/s %4.0f %% of the line",
+                  load.bytesPerSecond(), load.percent());
+    std::string bytes = load.recentBytes();
+    bytes.resize(3 * LineLoad::mostRecent, ' ');
     put({lineAt, panelAt.x}, bytes + rate.data());
     put({countsAt, panelAt.x},
         "unknown commands: " + std::to_string(display.unknownCommands()) +

@@ -4,13 +4,13 @@
 #include "emulator/FileDescriptor.h"
 #include "emulator/Finger.h"
 #include "emulator/Keypad.h"
+#include "emulator/LineLoad.h"
 #include "emulator/Loop.h"
 #include "emulator/Operator.h"
 #include "emulator/TerminalKeys.h"
 #include "emulator/TerminalRescue.h"
 
 #include <array>
-#include <deque>
 #include <functional>
 
 namespace emulator {
@@ -21,12 +21,8 @@ namespace emulator {
 /// this object is destroyed, and also when the program crashes.
 class TerminalFront : public Operator {
   public:
-    enum class Use {
-        operate, ///< the keyboard and the mouse are the keypad
-        watch,   ///< somebody else presses the keys; only q is taken
-    };
-
-    /// Takes over the terminal; throws std::runtime_error if the panel cannot be drawn on it.
+    /// Takes over the terminal; throws std::runtime_error if the panel cannot be drawn on it. Of
+    /// one who watches, only q is taken.
     TerminalFront(Loop &loop, const Display &display, Keypad &keypad, Use use);
     TerminalFront(const TerminalFront &) = delete;
     TerminalFront &operator=(const TerminalFront &) = delete;
@@ -36,7 +32,7 @@ class TerminalFront : public Operator {
     /// throws std::runtime_error when that of a watcher does.
     std::optional<int> look(TimePoint now) override;
     [[nodiscard]] std::optional<TimePoint> wakeAt() const override;
-    void carried(unsigned char byte) override;
+    void carried(unsigned char byte) override { load.carried(byte); }
 
     /// Draws for the terminal's size as it is now.
     void resize();
@@ -70,10 +66,7 @@ class TerminalFront : public Operator {
     bool isOver = false;
     bool isGone = false; // the terminal
     std::array<TimePoint, keys.size()> litUntil{};
-    std::deque<unsigned char> recent;
-    unsigned long counted = 0; // bytes since `countedSince`
-    TimePoint countedSince;
-    double bytesPerSecond = 0;
+    LineLoad load;
     TimePoint drawAgain;
 };
 

@@ -1,0 +1,34 @@
+#pragma once
+
+#include "emulator/Clock.h"
+
+#include <deque>
+#include <string>
+
+namespace emulator {
+
+/// What the line carries to the panel, for those who watch it: the last bytes, and how many come.
+class LineLoad {
+  public:
+    static constexpr std::size_t mostRecent = 12;
+
+    explicit LineLoad(TimePoint now) : countedSince(now) {}
+
+    void carried(unsigned char byte);
+    /// To be called now and then: the rate is that of the last second that has gone by.
+    void look(TimePoint now);
+
+    /// The last bytes in hexadecimal, the newest at the end, each with a blank behind it.
+    [[nodiscard]] std::string recentBytes() const;
+    [[nodiscard]] double bytesPerSecond() const { return rate; }
+    /// Of what the line can carry.
+    [[nodiscard]] double percent() const;
+
+  private:
+    std::deque<unsigned char> recent;
+    unsigned long counted = 0; // bytes since `countedSince`
+    TimePoint countedSince;
+    double rate = 0;
+};
+
+} // namespace emulator
