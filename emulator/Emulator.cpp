@@ -27,9 +27,9 @@ constexpr std::chrono::milliseconds longestTurn{1000};
 void announce(const WebServer &server) {
     std::cout << server.address() << std::endl;
     if (server.isOpenToOthers())
-        std::cerr << "panel-emulator: other machines can reach this page, by this machine's "
-                     "address: whoever has\nits whole address stands at the panel, and may press "
-                     "its keys; nothing is encrypted\n";
+        std::cerr
+            << "panel-emulator: other machines can open this page, too, at this machine's "
+               "address;\nwhoever has the link stands at the panel, and nothing is encrypted\n";
 }
 
 std::vector<std::string> withPath(std::vector<std::string> command, const std::string &path) {

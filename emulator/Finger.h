@@ -27,6 +27,8 @@ class Finger {
     void release(TimePoint now);
     /// Something was typed that is no key: it ends a hold.
     void letGo();
+    /// Whatever is down comes up, asked for or not.
+    void lift();
 
     void look(TimePoint now);
     [[nodiscard]] std::optional<TimePoint> wakeAt() const;
@@ -46,7 +48,6 @@ class Finger {
     };
 
     void putDown(Key key, Manner manner, TimePoint now);
-    void lift();
 
     Keypad &keypad;
     std::optional<Down> down;

@@ -79,7 +79,7 @@ std::optional<TimePoint> WebFront::wakeAt() const {
 
 void WebFront::finish(const std::string &reason) {
     ending = reason;
-    finger.release(Clock::now());
+    finger.lift();
     recorder.finish();
     server.finish(state());
 }
@@ -127,20 +127,18 @@ std::string WebFront::state() const {
 }
 
 bool WebFront::take(const WebSession &page, std::string_view message) {
-    const TimePoint now = Clock::now();
     if (message == releaseWord) {
-        leave(page);
+        if (presser == &page)
+            finger.release(Clock::now());
         return true;
     }
-    if (message.substr(0, pressWord.size()) != pressWord)
-        return false;
     const auto key = std::find_if(keys.begin(), keys.end(), [&](const KeyTraits &each) {
-        return each.name == message.substr(pressWord.size());
+        return message == std::string(pressWord) + std::string(each.name);
     });
     if (key == keys.end())
         return false;
     if (use == Use::operate && ending.empty()) {
-        finger.press(key->key, now);
+        finger.press(key->key, Clock::now());
         presser = &page;
     }
     return true;
@@ -149,7 +147,7 @@ bool WebFront::take(const WebSession &page, std::string_view message) {
 void WebFront::leave(const WebSession &page) {
     if (presser != &page)
         return;
-    finger.release(Clock::now());
+    finger.lift();
     presser = nullptr;
 }
 
