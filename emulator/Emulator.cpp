@@ -71,10 +71,10 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
             options.limit, options.pictures);
     if (options.web)
         webFront = std::make_unique<WebFront>(loop, *options.web, display, keypad, use);
-    if (isDrawn) {
-        commandOutput = output.open();
+    if (isDrawn)
         front = std::make_unique<TerminalFront>(loop, display, keypad, use);
-    }
+    if (isDrawn || !isJourney)
+        commandOutput = output.open();
     // After all that may refuse: an older recording is not given up for nothing.
     if (options.record)
         startRecording(*options.record);

@@ -63,18 +63,21 @@ function describeKey({ down, counted, polls }) {
   return `${keyNames[key]}${down ? " held" : ""}, ${count}: ${meaning(key, polls)}`;
 }
 
-let sayAgain = 0;
+let sayTimer = 0, changedSince = null;
 
-// A screen takes the line a fifth of a second: what is half drawn is not read out.
+// A screen takes the line a fifth of a second: what is half drawn is not read out. A key that runs
+// changes the display all the time: then it is read out once a second.
 function sayRows() {
-  clearTimeout(sayAgain);
-  sayAgain = setTimeout(() => {
+  changedSince ??= performance.now();
+  clearTimeout(sayTimer);
+  sayTimer = setTimeout(() => {
+    changedSince = null;
     state.rows.forEach((text, row) => {
       const line = element("text").children[row];
       if (line.textContent !== text)
         line.textContent = text;
     });
-  }, 250);
+  }, Math.min(250, Math.max(0, changedSince + 1000 - performance.now())));
 }
 
 function notice(text, isAlarm) {

@@ -107,6 +107,8 @@ class Page:
             if size >= 126:
                 size = int.from_bytes(self.take(2 if size == 126 else 8), "big")
             data = self.take(size)
+            if opcode == 0x89:
+                self.send(data.decode(), opcode=10)  # that it is still there
             if opcode == 0x81:
                 return json.loads(data)
 
