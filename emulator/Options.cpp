@@ -124,6 +124,8 @@ Options Options::parse(int argc, char *const *argv) {
         throw std::invalid_argument("no command to start");
     if (options.show && !options.journey)
         throw std::invalid_argument("--show goes with a --journey");
+    if (options.show && options.web)
+        throw std::invalid_argument("--show draws on the terminal, --web on a page: give one");
     return options;
 }
 
@@ -148,6 +150,9 @@ A key that is typed while the program does not ask for one is forgotten, as on a
 real panel. COMMAND's output is kept back; the last of it is shown if COMMAND ends
 by itself.
 
+On the page, a key is down for as long as it is held. Whoever has the page's address
+stands at the panel: it holds a token that is new at each start.
+
 A journey has one step a line; # begins a comment. KEY is up, down, enter or
 escape. A word with blanks stands in quotes, with \", \\ and \n for ", \ and a
 line feed. The steps are:
@@ -160,8 +165,8 @@ These steps can be played in the program's tests only, where time is virtual:
            R"(
 Exit status: 0 when the journey was played to its end; 1 when a step failed or
 COMMAND ended too early, or when not everything could be written; 2 for wrong
-usage; 128 + N after signal N. On the terminal: that of COMMAND if it ended by
-itself, 0 after q.
+usage; 128 + N after signal N. On the terminal and on the page: that of COMMAND if
+it ended by itself; on the terminal, 0 after q.
 )";
 }
 

@@ -85,8 +85,8 @@ void WebFront::finish(const std::string &reason) {
 }
 
 std::optional<WebService::Resource> WebFront::resource(std::string_view name) const {
-    const auto file = std::find_if(webFiles.begin(), webFiles.end(),
-                                   [&](const WebFile &each) { return each.name == name; });
+    const auto *file = std::find_if(webFiles.begin(), webFiles.end(),
+                                    [&](const WebFile &each) { return each.name == name; });
     if (file != webFiles.end())
         return Resource{file->type, std::string(file->text)};
     if (name == "font.json")
@@ -132,7 +132,7 @@ bool WebFront::take(const WebSession &page, std::string_view message) {
             finger.release(Clock::now());
         return true;
     }
-    const auto key = std::find_if(keys.begin(), keys.end(), [&](const KeyTraits &each) {
+    const auto *key = std::find_if(keys.begin(), keys.end(), [&](const KeyTraits &each) {
         return message == std::string(pressWord) + std::string(each.name);
     });
     if (key == keys.end())

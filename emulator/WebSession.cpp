@@ -12,7 +12,8 @@ namespace http = beast::http;
 namespace websocket = beast::websocket;
 using boost::system::error_code;
 
-constexpr std::chrono::seconds requestTime{5}; // for a request and its answer
+constexpr std::chrono::seconds requestTime{5}; // for a request to be there as a whole
+constexpr std::chrono::seconds answerTime{30}; // for its answer to be taken
 constexpr std::chrono::seconds writeTime{5};   // for a state to be taken
 constexpr std::chrono::seconds silence{6};     // of a browser that does not even answer a ping
 constexpr std::size_t mostHeaderBytes = 8192;
@@ -96,6 +97,7 @@ void WebSession::respond(http::status status, WebService::Resource resource) {
                      beast::string_view(resource.type.data(), resource.type.size()));
     response.body() = std::move(resource.body);
     response.prepare_payload();
+    socket.next_layer().expires_after(answerTime);
     http::async_write(socket.next_layer(), response, then(&WebSession::close));
 }
 

@@ -27,8 +27,9 @@ FLAGS = ("--headless=new --no-sandbox --disable-gpu --disable-quic --no-first-ru
          "--disable-background-networking --disable-component-update --disable-sync --hide-scrollbars")
 KEYS = {"up": Keys.ARROW_UP, "down": Keys.ARROW_DOWN, "enter": Keys.ENTER, "escape": Keys.ESCAPE}
 
-# Draws, asks for a key and ends.
-FAULT = r"exec 3<>$PANEL_TTY; printf '\376\001fault\376\006' >&3; sleep 12; exit 150"
+# Opens the panel as a program does that has been restarted, draws, asks for a key and ends.
+FAULT = r"""exec 3<>$PANEL_TTY; printf '\376\050%.0s' 1 2 3 4 >&3
+printf '\376\001fault\376\006' >&3; sleep 12; exit 150"""
 
 
 class Browser:
@@ -134,8 +135,8 @@ class InBrowser(unittest.TestCase):
     def setUp(self):
         self.folder = self.enterContext(tempfile.TemporaryDirectory())
 
-    def start(self, command=(*IN_BOX,), *options):
-        panel = self.enterContext(Panel(EMULATOR, command, *options))
+    def start(self, *options):
+        panel = self.enterContext(Panel(EMULATOR, IN_BOX, *options))
         return panel, Browser(self, panel.address, self.folder)
 
     def test_an_address_is_set_by_holding_a_drawn_key_and_the_saved_journey_plays_it_again(self):
@@ -191,7 +192,7 @@ class InBrowser(unittest.TestCase):
         self.assertEqual([*last], other.rows())
 
     def test_a_cut_connection_is_said_and_comes_back_and_the_end_is_said_with_the_status(self):
-        panel, _ = self.start(["sh", "-c", FAULT])
+        panel = self.enterContext(Panel(EMULATOR, ["sh", "-c", FAULT]))
         cable = Cable(panel.port)
         page = Browser(self, panel.address.replace(str(panel.port), str(cable.port)),
                        self.folder)
@@ -200,13 +201,14 @@ class InBrowser(unittest.TestCase):
         page.expect_text("notice", "connection is lost")
         cable.is_cut = False
         page.expect_text("notice", "Connected")
+        self.assertEqual(page.text("program"), "restarted")
         page.expect_text("notice", "has ended: the program ended with status 150")
         self.assertIn('expect "fault" ""', page.saved(self.folder).read_text(encoding="ascii"))
 
     def test_a_killed_emulator_is_a_lost_connection_and_a_journey_is_only_watched(self):
         journey = Path(self.folder, "journey")
         journey.write_text('expect "Kestrova (TM)"\nwait 60\n', encoding="ascii")
-        panel, page = self.start((*IN_BOX,), "--journey", str(journey))
+        panel, page = self.start("--journey", str(journey))
         page.expect_text("notice", "you can watch")
         self.assertFalse(page.key("up").is_enabled())
         panel.process.kill()
