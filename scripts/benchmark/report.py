@@ -1,0 +1,107 @@
+"""Samples as a table for a terminal or for the documentation, and as a drawing of the latencies."""
+
+import os
+import platform
+import statistics
+import subprocess
+
+from figures import FIGURES
+
+PERCENTILE_SAMPLES = 100  # a 99th percentile of fewer says no more than the largest
+
+
+def number(value):
+    if value is None:
+        return ""
+    digits = 0 if abs(value) >= 100 or value == int(value) else 1 if abs(value) >= 10 else 2
+    return f"{value:,.{digits}f}"
+
+
+def spread(values):
+    """Smallest, median, 99th percentile where there is one, and largest."""
+    ordered = sorted(values)
+    enough = len(ordered) >= PERCENTILE_SAMPLES
+    return (ordered[0], statistics.median(ordered),
+            ordered[len(ordered) * 99 // 100] if enough else None, ordered[-1])
+
+
+def floor_of(figure, samples):
+    return statistics.median(samples[figure.floor]) if isinstance(figure.floor, str) else figure.floor
+
+
+def rows(samples, others):
+    """The table's cells; `others` are another program's samples, or None."""
+    head = ["figure", "unit", "runs", "min", "median", "99 %", "max", "floor", "ratio"]
+    yield head + (["other's median", "this / other"] if others else [])
+    for figure in FIGURES:
+        values = samples[figure.key]
+        least, median, high, most = spread(values)
+        floor = floor_of(figure, samples)
+        ratio = f"{median / floor:.2f}" if floor else ""
+        row = [figure.title, figure.unit, str(len(values)), number(least), number(median),
+               number(high), number(most), number(floor), ratio]
+        if others:
+            other = statistics.median(others[figure.key])
+            row += [number(other), f"{median / other:.2f}" if other else ""]
+        yield row
+
+
+def as_text(samples, others):
+    table = list(rows(samples, others))
+    widths = [max(map(len, column)) for column in zip(*table)]
+    return "\n".join("  ".join(
+        cell.ljust(width) if place < 2 else cell.rjust(width)
+        for place, (cell, width) in enumerate(zip(row, widths))).rstrip() for row in table)
+
+
+def as_markdown_table(samples, others):
+    head, *body = rows(samples, others)
+    meanings = {figure.title: figure.meaning for figure in FIGURES}
+    lines = [head + ["what it means to an operator"], ["---", "---"] + ["--:"] * (len(head) - 2) + ["---"]]
+    lines += [row + [meanings[row[0]]] for row in body]
+    return "\n".join(f"| {' | '.join(line)} |" for line in lines)
+
+
+def machine():
+    with open("/proc/cpuinfo") as processors:
+        model = next((line.partition(":")[2].strip() for line in processors
+                      if line.startswith("model name")), platform.machine())
+    return f"{os.cpu_count()} processors ({model}), Linux {platform.release()}"
+
+
+def draw_latencies(samples, others, path):
+    """The share of keys that were answered within a time, on a logarithmic scale, by gnuplot."""
+    curves = [("kestrova-panel", samples["key to first byte"]),
+              ("a program that only answers", samples["key to first byte, floor"])]
+    if others:
+        curves.append(("the program compared with", others["key to first byte"]))
+    script = ["set terminal svg size 720,360 font 'sans-serif,13' background '#ffffff'", f"set output '{path}'",
+              "set logscale x", "set xlabel 'time from the key answer to the first byte (ms)'",
+              "set ylabel 'share of keys (%)'", "set yrange [0:100]", "set grid", "set key bottom right"]
+    for index, (_, values) in enumerate(curves):
+        points = (f"{value} {100 * place / len(values)}" for place, value in enumerate(sorted(values), 1))
+        script += [f"$curve{index} << END", *points, "END"]
+    script.append("plot " + ", ".join(f"$curve{index} with lines linewidth 2 title '{title}'"
+                                      for index, (title, _) in enumerate(curves)))
+    subprocess.run(["gnuplot"], input="\n".join(script), text=True, check=True)
+
+
+def as_page(samples, others, picture):
+    return f"""\
+# What it costs, and how fast it answers
+
+`scripts/bench --markdown` wrote this page. It ran the program in the box, on the emulated panel: on
+{machine()}.
+
+A floor is what nobody can do with less: the serial line takes 4.58 ms a byte, and a turn has six
+calls. For the time from a key's answer to the first byte, the floor is what a program needs that
+does nothing but answer. The ratio is the median's to the floor. Where a figure depends on the
+machine, only `scripts/bench --compare REVISION` on one machine tells whether a change has helped:
+it runs two programs alternately.
+
+{as_markdown_table(samples, others)}
+
+![How many keys have been answered within what time]({picture})
+
+The emulated line delivers a key's answer at once; at 2400 baud its two bytes take 9.2 ms more.
+"""
