@@ -61,7 +61,8 @@ void act(Dice &dice, Lines &journey, bool &isKeyDown) {
     static const Lines polls = {"1", "1", "1", "2", "5", "6", "7", "30"};
     const int what = dice.upTo(11);
     if (what < 8) {
-        journey.push_back("hold " + dice.oneOf(names) + " " + dice.oneOf(polls));
+        const std::string name = dice.oneOf(names); // in this order with every compiler
+        journey.push_back("hold " + name + " " + dice.oneOf(polls));
         isKeyDown = dice.upTo(7) == 0; // else the next key follows without a release
         if (!isKeyDown)
             journey.emplace_back("release");

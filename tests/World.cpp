@@ -114,7 +114,7 @@ ssize_t __wrap_read(int descriptor, void *buffer, size_t size) {
     EXPECT_EQ(size, 255U);
     EXPECT_NE(world().unread, "") << "read without an answer";
     world().reads++;
-    const std::string answers = std::exchange(world().unread, "");
+    const std::string &answers = world().lastRead = std::exchange(world().unread, "");
     return static_cast<ssize_t>(answers.copy(static_cast<char *>(buffer), size));
 }
 

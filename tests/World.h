@@ -30,6 +30,7 @@ struct World {
     }};
     std::string unread;      // answers that the program has not read
     unsigned long reads = 0; // of answers
+    std::string lastRead;    // may be several answers, of which the first counts
 
     /// Somebody looks at the panel whenever it has taken in a byte or time has passed, and when he
     /// wants to.
