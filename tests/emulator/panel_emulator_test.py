@@ -132,7 +132,7 @@ class WithoutTerminal(unittest.TestCase):
 
         helped = subprocess.run([EMULATOR, "--help"], capture_output=True, text=True, check=True)
         steps = helped.stdout[helped.stdout.index("The steps are:"):]
-        page = Path(__file__).parents[2].joinpath("packaging/man/kestrova-journey.5.in")
+        page = Path(__file__).parents[2].joinpath("packaging/man/kestrova-journey.5")
         listed = re.findall(r"^\.It Ic (.*)", page.read_text(encoding="ascii"), re.M)
         self.assertGreater(len(listed), 20)
         self.assertEqual(words(re.findall(r"^  (\S.*?)(?:  |$)", steps, re.M)), words(listed))
