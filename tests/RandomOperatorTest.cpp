@@ -10,8 +10,8 @@
 
 namespace {
 
-constexpr unsigned journeyCount = 80;
-constexpr long long leastTurns = 1'000'000;
+constexpr unsigned journeyCount = JOURNEY_COUNT;
+constexpr long long leastTurns = journeyCount * 12'500LL;
 constexpr int actionsPerJourney = 900;
 
 using Lines = std::vector<std::string>;
