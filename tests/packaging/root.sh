@@ -1,27 +1,12 @@
 #!/bin/sh
 # Installs, runs, upgrades, removes and purges the packages of folder $1 in a throw-away Debian with a
-# service manager of its own. What is not real there: the line is a pseudo-terminal, and its record
-# among the devices is written by hand, in the place of a terminal that the kernel has.
+# service manager of its own, where those of folder $2 were installed first. What is not real there:
+# the line is a pseudo-terminal, and its record among the devices is written by hand, in the place of
+# a terminal that the kernel has.
 here=$(dirname "$(realpath "$0")")
 . "$here/../box/expect.sh"
-. "$here/../../scripts/bare-debian.sh"
-work=$(mktemp -d) || exit 1
-root=$work/root
+. "$here/throw-away.sh"
 trap '[ -z "${manager-}" ] || kill -KILL "$(leader)" 2>/dev/null; wait; rm -rf "$work"' EXIT
-trap 'exit 1' HUP INT TERM
-
-cannot() { # said loudly; where CI runs it has to be possible
-    echo "SKIPPED: THE PACKAGES WERE NOT INSTALLED ANYWHERE: $*"
-    [ "${CI-}" != true ] && exit 0
-    exit 1
-}
-give_up() {
-    echo "FAILED $*"
-    exit 1
-}
-must() { "$@" >"$work/log" 2>&1 || { cat "$work/log"; give_up "$@"; }; }
-export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
-container="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --directory=$root"
 leader() { cut -d " " -f 1 "/proc/$manager/task/$manager/children" 2>/dev/null; }
 inside() { nsenter --target "$(leader)" --all env -i PATH=/usr/sbin:/usr/bin "$@"; }
 boot() {
@@ -40,9 +25,10 @@ leftovers() {
         \( -name '*kestrova*' -o -name '*ttyS1*' -o -name 'panel-emulator*' \) -print
 }
 
-[ "$(id -u)" -eq 0 ] || cannot "root alone can"
-bare_debian "$root" debian-12 --include=systemd-sysv,iproute2,ifupdown || cannot "debootstrap failed"
-cp "$1"/*.deb "$here/line" "$root/root"
+throw_away debian-12 --include=systemd-sysv,iproute2,ifupdown
+mkdir "$root/root/before"
+cp "$2"/kestrova-panel_*.deb "$2"/kestrova-panel-tools_*.deb "$root/root/before"
+cp "$1"/kestrova-panel_*.deb "$1"/kestrova-panel-tools_*.deb "$here/line" "$root/root"
 dpkg-deb -R "$1"/kestrova-panel_*.deb "$work/upgrade"
 sed -i '/^Version:/s/$/.1/' "$work/upgrade/DEBIAN/control"
 must dpkg-deb -b "$work/upgrade" "$root/root/upgrade.deb"
@@ -85,10 +71,9 @@ TEXT
 } >"$root/root/all.journey"
 
 # Where no service manager runs, as in an image's build.
-apt='export DEBIAN_FRONTEND=noninteractive; apt-get -q update && apt-get -q -y --no-install-recommends'
 must $container sh -c "$apt install /root/kestrova-panel_*.deb && dpkg --purge kestrova-panel"
 expect "left after an installation without a service manager" "" "$(leftovers)"
-must $container sh -c "$apt install /root/kestrova-*.deb"
+must $container sh -c "$apt install /root/before/*.deb && $apt install /root/kestrova-panel-tools_*.deb"
 expect "enabled" kestrova-panel.service "$(ls "$root/etc/systemd/system/dev-ttyS1.device.wants")"
 
 cp -R "$root"/usr/share/kestrova-panel/box/appliance/[eo]* "$root"
@@ -108,7 +93,7 @@ must inside sh -ec '
         "option subnet 255.255.255.0" >/run/udhcpd.conf
     touch /var/lib/misc/udhcpd.leases
     udhcpd /run/udhcpd.conf
-    systemd-run sh -c "panel-emulator --fast --trace /root/trace --journey /root/all.journey \
+    systemd-run sh -c "panel-emulator --fast --journey /root/all.journey \
         -- sleep infinity >/root/played 2>&1; systemctl poweroff"'
 must timeout 900 tail -f --pid=$manager /dev/null
 wait $manager
@@ -116,8 +101,6 @@ wait $manager
     cat "$root/root/played"
     give_up "to come to the reboot"
 }
-echo "first byte on the line after $((($(head -n 1 "$root/root/trace" | cut -d ' ' -f 1) / 1000 -
-    $(cat "$root/root/started")) / 1000)) ms"
 
 boot
 expect "name after the reboot" rack12-monitor-wesub "$(inside hostname)"

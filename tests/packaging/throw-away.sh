@@ -1,0 +1,26 @@
+# Sourced: a Debian 12 below $root, which goes with $work at the end; $container runs commands in it.
+. "$here/../../scripts/bare-debian.sh"
+work=$(mktemp -d) || exit 1
+root=$work/root
+trap 'rm -rf "$work"' EXIT
+trap 'exit 1' HUP INT TERM
+
+export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
+container="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --directory=$root"
+apt='apt-get -q update && DEBIAN_FRONTEND=noninteractive apt-get -q -y --no-install-recommends'
+
+cannot() { # said loudly; where CI runs it has to be possible
+    echo "SKIPPED: THE PACKAGES WERE NOT INSTALLED ANYWHERE: $*"
+    [ "${CI-}" != true ] && exit 0
+    exit 1
+}
+give_up() {
+    echo "FAILED $*"
+    exit 1
+}
+must() { "$@" >"$work/log" 2>&1 || { cat "$work/log"; give_up "$@"; }; }
+
+throw_away() { # NAME OPTION..., as for bare_debian
+    [ "$(id -u)" -eq 0 ] || cannot "root alone can"
+    bare_debian "$root" "$@" || cannot "debootstrap failed"
+}
