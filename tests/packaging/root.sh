@@ -25,7 +25,7 @@ leftovers() {
         \( -name '*kestrova*' -o -name '*ttyS1*' -o -name 'panel-emulator*' \) -print
 }
 
-throw_away debian-12 --include=systemd-sysv,iproute2,ifupdown
+must bare_debian "$root" debian-12 --include=systemd-sysv,iproute2,ifupdown
 mkdir "$root/root/before"
 cp "$2"/kestrova-panel_*.deb "$2"/kestrova-panel-tools_*.deb "$root/root/before"
 cp "$1"/kestrova-panel_*.deb "$1"/kestrova-panel-tools_*.deb "$here/line" "$root/root"

@@ -9,18 +9,8 @@ export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
 container="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --directory=$root"
 apt='apt-get -q update && DEBIAN_FRONTEND=noninteractive apt-get -q -y --no-install-recommends'
 
-cannot() { # said loudly; where CI runs it has to be possible
-    echo "SKIPPED: THE PACKAGES WERE NOT INSTALLED ANYWHERE: $*"
-    [ "${CI-}" != true ] && exit 0
-    exit 1
-}
 give_up() {
     echo "FAILED $*"
     exit 1
 }
 must() { "$@" >"$work/log" 2>&1 || { cat "$work/log"; give_up "$@"; }; }
-
-throw_away() { # NAME OPTION..., as for bare_debian
-    [ "$(id -u)" -eq 0 ] || cannot "root alone can"
-    bare_debian "$root" "$@" || cannot "debootstrap failed"
-}
