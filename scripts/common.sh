@@ -60,5 +60,14 @@ configure() {
     cmake "$@"
 }
 
+# compile FOLDER PRESET [TARGET...]: all targets, or just these.
+compile() {
+    folder=$1
+    preset=$2
+    shift 2
+    configure "$folder" --preset "$preset" &&
+        cmake --build --preset "$preset" -j"$(nproc)" ${1:+--target "$@"}
+}
+
 # Also root may ask, in somebody else's checkout.
 ask_git() { git -c safe.directory="$PWD" "$@"; }
