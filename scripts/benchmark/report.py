@@ -90,18 +90,21 @@ def as_page(samples, others, picture):
     return f"""\
 # What it costs, and how fast it answers
 
-`scripts/bench --markdown` wrote this page. It ran the program in the box, on the emulated panel: on
-{machine()}.
+This page was written by `scripts/bench --markdown`, which ran the program in the sandbox on the
+emulated panel. The machine had {machine()}.
 
-A floor is what nobody can do with less: the serial line takes 4.58 ms a byte, and a turn has six
-calls. For the time from a key's answer to the first byte, the floor is what a program needs that
-does nothing but answer. The ratio is the median's to the floor. Where a figure depends on the
-machine, only `scripts/bench --compare REVISION` on one machine tells whether a change has helped:
-it runs two programs alternately.
+A floor is what cannot be done with less: the serial line takes 4.58 ms for a byte, and a turn makes
+six system calls. For the time from a key's answer to the first byte, the floor is the time that a
+program needs which does nothing but answer, on the same machine at the same time. The ratio is that
+of the median to the floor. Most figures depend on the machine, so only `scripts/bench --compare
+REVISION` tells whether a change has helped: it measures two programs in turn on one machine.
 
 {as_markdown_table(samples, others)}
 
 ![How many keys have been answered within what time]({picture})
 
-The emulated line delivers a key's answer at once; at 2400 baud its two bytes take 9.2 ms more.
+Where the two curves run together, the time is that of the pseudo-terminal and of the machine. The
+kernel hands the bytes over by a worker of its own, which waits for a processor like everybody else:
+the slowest answers come from there. The emulated line delivers an answer at once; on a real line its
+two bytes take another 9.2 ms.
 """
