@@ -96,7 +96,7 @@ def start(program):
     samples = defaultdict(list)
     with appliance_with(program) as folder, Panel(folder) as panel:
         shown = panel.time_of(FIRST_PAGE)
-        started = float(process.environment(panel.pid)["STARTED"])
+        started = panel.start_time()
         samples["start to first byte"].append((panel.trace().arrived[0] - started) * 1e3)
         samples["start to first page"].append((shown - started) * 1e3)
     return samples
@@ -107,7 +107,7 @@ def growth(program, name, turns, **size):
     samples = defaultdict(list)
     steps = TO_THE_PORT_S_PAGE + "tap enter\ntap escape\n" * turns + f"tap down {turns}"
     with appliance_with(program, **size) as folder, Panel(folder, steps) as panel:
-        started = float(process.environment(panel.pid)["STARTED"])
+        started = panel.start_time()
         samples[f"start, {name}"].append((panel.time_of(FIRST_PAGE) - started) * 1e3)
         redraws = panel.trace_when_played().redraws()
         samples[f"port, {name}"] += [drawn.to_first_byte * 1e3 for drawn in redraws[-3 * turns:-turns:2]]

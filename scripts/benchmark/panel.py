@@ -81,6 +81,10 @@ class Panel(Running):
             "--", *(command or [BOX, "--appliance", folder, "--", "/usr/bin/python3", "-ISc", START])])
         self.pid = None if command else self.find_program()
 
+    def start_time(self):
+        """When the unit's command was given; the program has its name a moment before its variables."""
+        return float(wait_until(lambda: process.environment(self.pid).get("STARTED"), "the start"))
+
     def trace(self):
         return Trace(self.trace_path)
 
