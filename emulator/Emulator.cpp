@@ -62,7 +62,6 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
                    [this](int number) { handleSignal(number); });
     setenv("PANEL_TTY", line.path().c_str(), 1);
     FileDescriptor commandOutput;
-    const bool isDrawn = options.show || (!journey && !options.web);
     isJourney = journey.has_value();
     const Use use = isJourney ? Use::watch : Use::operate;
     if (isJourney)
@@ -71,9 +70,9 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
             options.limit, options.pictures);
     if (options.web)
         webFront = std::make_unique<WebFront>(loop, *options.web, display, keypad, use);
-    if (isDrawn)
+    if (options.isDrawn())
         front = std::make_unique<TerminalFront>(loop, display, keypad, use);
-    if (isDrawn || !isJourney)
+    if (options.isDrawn() || !isJourney)
         commandOutput = output.open();
     // After all that may refuse: an older recording is not given up for nothing.
     if (options.record)

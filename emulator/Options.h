@@ -23,6 +23,9 @@ struct Options {
     Clock::duration limit = std::chrono::seconds(10);
     std::vector<std::string> command;
 
+    /// True when the panel is drawn on the terminal.
+    [[nodiscard]] bool isDrawn() const { return show || (!journey && !web); }
+
     /// Reads the program's arguments. Throws std::invalid_argument with one line when they are
     /// wrong.
     static Options parse(int argc, char *const *argv);

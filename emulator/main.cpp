@@ -55,8 +55,7 @@ int main(int argc, char **argv) {
         }
         if (options.journey)
             journey = readJourney(*options.journey);
-        const bool isDrawn = options.show || (!journey && !options.web);
-        if (isDrawn && (!isatty(STDIN_FILENO) || !isatty(STDOUT_FILENO)))
+        if (options.isDrawn() && (!isatty(STDIN_FILENO) || !isatty(STDOUT_FILENO)))
             throw std::invalid_argument(journey ? "not on a terminal: nothing to --show it on"
                                                 : "not on a terminal: give a --journey or --web");
         if (options.pictures)
