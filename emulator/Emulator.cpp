@@ -131,7 +131,7 @@ void Emulator::handleSignal(int number) {
         const auto stop = [] { raise(SIGSTOP); };
         front ? front->stopWith(stop) : stop();
     } else if (!result) {
-        finish(signalStatus + number, "ended by a signal (" + std::string(strsignal(number)) + ")");
+        finish(signalStatus + number, "a signal ended it (" + std::string(strsignal(number)) + ")");
     }
 }
 
