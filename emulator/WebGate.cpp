@@ -2,6 +2,7 @@
 
 #include <boost/asio/ip/address.hpp>
 
+#include <algorithm>
 #include <array>
 #include <stdexcept>
 #include <sys/random.h>

@@ -20,7 +20,7 @@ class WebGate {
     [[nodiscard]] std::optional<std::string_view> nameBehindToken(std::string_view target) const;
 
     /// True for an address in figures and for localhost, with or without a port. Any other name
-    /// can be made to lead here by whoever owns it, and his page would then be of the same origin.
+    /// can be made to lead here by its owner, whose page would then be of the same origin.
     [[nodiscard]] static bool isOwnHost(std::string_view host);
     /// True when a page that was loaded from this host says so itself.
     [[nodiscard]] static bool isSameOrigin(std::string_view origin, std::string_view host);
