@@ -56,11 +56,12 @@ function meaning(key, polls) {
 }
 
 function describeKey({ down, counted, polls }) {
-  const key = polls ? counted : down;
+  const key = down ?? (polls ? counted : null);
   if (!key)
     return "none is down";
-  const count = polls === 1 ? "1 poll" : `${polls} polls`;
-  return `${keyNames[key]}${down ? " held" : ""}, ${count}: ${meaning(key, polls)}`;
+  const own = key === counted ? polls : 0;
+  const count = own === 1 ? "1 poll" : `${own} polls`;
+  return `${keyNames[key]}${down ? " held" : ""}, ${count}: ${meaning(key, own)}`;
 }
 
 let sayTimer = 0, changedSince = null;
@@ -187,7 +188,7 @@ for (const button of keyButtons) {
 // the two lines that every journey begins with.
 element("save").addEventListener("click", async () => {
   try {
-    const text = state.journey ?? await (await fetch("journey")).text();
+    const text = state.journey ?? await fetched("journey", "text");
     const head = text.split("\n", 2).join("\n") + "\n";
     const link = document.createElement("a");
     link.href = URL.createObjectURL(new Blob([head, text.slice(opened)], { type: "text/plain" }));
@@ -198,6 +199,13 @@ element("save").addEventListener("click", async () => {
     notice("The journey could not be fetched.", true);
   }
 });
+
+async function fetched(name, kind) {
+  const answer = await fetch(name);
+  if (!answer.ok)
+    throw new Error(answer.status);
+  return answer[kind]();
+}
 
 const retryTime = 1000;
 
@@ -212,7 +220,7 @@ function connectAgain() {
 
 async function connect() {
   try {
-    font ??= await (await fetch("font.json")).json();
+    font ??= await fetched("font.json", "json");
   } catch {
     return connectAgain();
   }
