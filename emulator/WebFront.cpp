@@ -12,6 +12,8 @@ namespace emulator {
 namespace {
 
 constexpr std::chrono::milliseconds frameTime{50};
+// A page that hears nothing for some seconds takes the connection for lost.
+constexpr std::chrono::seconds repeatTime{1};
 constexpr std::streamoff mostRecorded = 1 << 20; // bytes: many hours of pressing keys
 constexpr std::string_view pressWord = "press ";
 constexpr std::string_view releaseWord = "release";
@@ -62,7 +64,8 @@ std::optional<int> WebFront::look(TimePoint now) {
     load.look(now);
     if (now >= showAgain && server.hasPages()) {
         showAgain = now + frameTime;
-        if (std::string newest = state(); newest != shown) {
+        if (std::string newest = state(); newest != shown || now >= repeat) {
+            repeat = now + repeatTime;
             shown = newest;
             server.show(std::move(newest));
         }

@@ -53,8 +53,9 @@ class WebFront : public Operator, private WebService {
     std::streamoff recorded = 0; // bytes of it
     std::string ending;          // why all is over, once it is
     std::string shown;           // the last state
-    TimePoint showAgain;
-    WebServer server; // the last: its connections use all of the above until it is gone
+    TimePoint showAgain;         // if it has changed
+    TimePoint repeat;            // even if it has not
+    WebServer server;            // the last: its connections use all of the above until it is gone
 };
 
 } // namespace emulator

@@ -208,8 +208,20 @@ async function fetched(name, kind) {
 }
 
 const retryTime = 1000;
+const patience = 4000;  // the emulator sends a state every second, even if nothing has changed
+let silenceTimer = 0;
+
+function awaitState() {
+  clearTimeout(silenceTimer);
+  silenceTimer = setTimeout(() => {
+    socket.onclose = socket.onmessage = null;  // closing takes long where nobody answers
+    socket.close();
+    connectAgain();
+  }, patience);
+}
 
 function connectAgain() {
+  clearTimeout(silenceTimer);
   presser = null;
   if (state?.ending)
     return;
@@ -227,8 +239,12 @@ async function connect() {
   const address = new URL("panel", location.href);
   address.protocol = "ws:";
   socket = new WebSocket(address);
-  socket.onmessage = event => show(JSON.parse(event.data));
+  socket.onmessage = event => {
+    awaitState();
+    show(JSON.parse(event.data));
+  };
   socket.onclose = connectAgain;
+  awaitState();
 }
 
 new ResizeObserver(drawGlass).observe(element("glass"));

@@ -2,6 +2,7 @@
 """The page of panel-emulator (the first argument) in a real browser, with the program (the second
 argument) in the box. A third argument is a file for a picture of the page."""
 
+import signal
 import subprocess
 import sys
 import tempfile
@@ -144,6 +145,9 @@ class InBrowser(unittest.TestCase):
         other.tap("down")
         time.sleep(0.5)
         self.assertTrue(other.saved().endswith('expect "{}" "{}"\n'.format(*other.rows())))
+        for number, said in ((signal.SIGSTOP, "connection is lost"), (signal.SIGCONT, "Connected")):
+            panel.process.send_signal(number)
+            other.expect_text("notice", said)
 
     def test_a_lost_connection_comes_back_and_the_end_is_said_with_the_status(self):
         _, page = self.start(command=["sh", "-c", FAULT])
