@@ -20,6 +20,9 @@ class Recorder : public Operator {
     Recorder(std::ostream &output, const Display &display, const Keypad &keypad);
 
     std::optional<int> look(TimePoint now) override;
+    /// True when what has been written ends before a key and what the panel showed at it: what is
+    /// written from here on is a journey of its own.
+    [[nodiscard]] bool isBetweenKeys() const { return !held && !isKeyDown; }
     /// Writes the end, if it is to end now.
     void finish();
     /// The steps that would be the end if it were now: the key that is being counted, and what the

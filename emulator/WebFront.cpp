@@ -57,9 +57,10 @@ WebFront::WebFront(Loop &loop, const boost::asio::ip::tcp::endpoint &endpoint,
       recorder(recording, itsDisplay, itsKeypad), server(loop, endpoint, *this) {}
 
 std::optional<int> WebFront::look(TimePoint now) {
-    if (recorded < mostRecorded)
+    if (isRecording())
         recorder.look(now);
-    recorded = recording.tellp();
+    if (recorder.isBetweenKeys())
+        recorded = recording.tellp();
     finger.look(now);
     load.look(now);
     if (now >= showAgain && server.hasPages()) {
@@ -83,7 +84,8 @@ std::optional<TimePoint> WebFront::wakeAt() const {
 void WebFront::finish(const std::string &reason) {
     ending = reason;
     finger.lift();
-    recorder.finish();
+    if (isRecording())
+        recorder.finish();
     server.finish(state());
 }
 
@@ -152,6 +154,10 @@ void WebFront::leave(const WebSession &page) {
         return;
     finger.lift();
     presser = nullptr;
+}
+
+bool WebFront::isRecording() {
+    return recording.tellp() < mostRecorded;
 }
 
 std::string WebFront::programState() const {

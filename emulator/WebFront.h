@@ -39,6 +39,7 @@ class WebFront : public Operator, private WebService {
     bool take(const WebSession &page, std::string_view message) override;
     void leave(const WebSession &page) override;
 
+    [[nodiscard]] bool isRecording();
     [[nodiscard]] std::string programState() const;
     [[nodiscard]] std::string journey() const;
 
@@ -50,7 +51,7 @@ class WebFront : public Operator, private WebService {
     LineLoad load;
     std::ostringstream recording; // of all that has been done since the start
     Recorder recorder;
-    std::streamoff recorded = 0; // bytes of it
+    std::streamoff recorded = 0; // bytes of it, before the key that is being counted
     std::string ending;          // why all is over, once it is
     std::string shown;           // the last state
     TimePoint showAgain;         // if it has changed
