@@ -170,15 +170,18 @@ class InBrowser(unittest.TestCase):
         page.expect_text("notice", "you can watch")
         self.assertFalse(page.key("up").is_enabled())
         colours = []
-        for width, height, scheme in ((320, 640, "light"), (1000, 700, "dark"), (1920, 1080, "light")):
+        for width, height, scheme in ((320, 568, "light"), (1000, 700, "dark"),
+                                      (568, 320, "light"), (1920, 1080, "light")):
             page.look(width, height, scheme)
             measured, colour = page.driver.execute_script(
                 "return [document.documentElement.scrollWidth,"
                 " getComputedStyle(document.documentElement).backgroundColor]")
             self.assertLessEqual(measured, width)
-            self.assertGreaterEqual(page.key("escape").rect["height"], 44)
+            key = page.key("escape").rect
+            self.assertGreaterEqual(key["height"], 44)
+            self.assertLessEqual(key["y"] + key["height"], height)
             colours.append(colour)
-        self.assertEqual([colour == colours[0] for colour in colours], [True, False, True])
+        self.assertEqual([colour == colours[0] for colour in colours], [True, False, True, True])
         panel.process.kill()
         page.expect_text("notice", "connection is lost")
 
