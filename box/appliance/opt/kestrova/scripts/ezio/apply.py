@@ -1,16 +1,12 @@
 #!/usr/bin/python3
-"""Applies what an operator set at the front panel.
+"""Applies what an operator has set at the front panel.
 
-    apply.py iface --name PORT --dhcp [--dns SERVER]...
-    apply.py iface --name PORT --ipaddress A --netmask M [--gateway G] [--dns SERVER]...
-    apply.py hostname --hostname NAME
+The integrator's guide (docs/integration.md) describes how the panel program calls a configuration
+script and what such a script has to do.
 
-Nothing is ever printed on standard output: the panel program reads the exit status there. It is
-0 when all is applied, 1 when something failed, 2 when the arguments were refused. The reason
-stands in apply.log beside this file, and the configuration files are then as they were.
-
-Only one of these scripts works at a time: a second one, which an operator can start when the panel
-program has been restarted meanwhile, waits for the first.
+The exit status of this one is 0 if everything has been applied, 1 if something has failed, and 2 if
+the arguments were refused. After a failure or a refusal the configuration files are as they were
+before, and apply.log beside this file gives the reason.
 """
 
 import argparse
@@ -46,15 +42,15 @@ STANZA_WORDS = {"iface", "mapping", "auto", "source", "source-directory", "no-au
 
 
 class Refused(Exception):
-    """The arguments make no sense; nothing was touched."""
+    """The arguments make no sense, and nothing has been changed."""
 
 
 class Failed(Exception):
-    """The arguments are good, but they could not be applied."""
+    """The arguments are valid but could not be applied."""
 
 
 class Parser(argparse.ArgumentParser):
-    """Reports by exception, and never on standard output."""
+    """Reports errors by an exception, and prints nothing on standard output."""
 
     def __init__(self, **options):
         super().__init__(allow_abbrev=False, **options)
@@ -76,7 +72,7 @@ def port_name(text):
 def host_address(text):
     address = ipaddress.IPv4Address(text)
     if address.is_unspecified or address.is_loopback or address.is_multicast:
-        raise argparse.ArgumentTypeError(f"{text} is no host's address")
+        raise argparse.ArgumentTypeError(f"{text} is not the address of a host")
     return address
 
 
@@ -84,19 +80,19 @@ def netmask(text):
     mask = ipaddress.IPv4Address(text)
     host_bits = ~int(mask) & 0xFFFFFFFF
     if mask.is_unspecified or host_bits & (host_bits + 1):
-        raise argparse.ArgumentTypeError(f"{text} is no netmask")
+        raise argparse.ArgumentTypeError(f"{text} is not a netmask")
     return mask
 
 
 def host_name(text):
     label = r"[A-Za-z0-9]([A-Za-z0-9-]{0,61}[A-Za-z0-9])?"
     if len(text) > HOST_NAME_MAX or not re.fullmatch(rf"{label}(\.{label})*", text):
-        raise argparse.ArgumentTypeError(f"'{text}' is no host name")
+        raise argparse.ArgumentTypeError(f"'{text}' is not a host name")
     return text
 
 
 def parse(arguments):
-    """The checked arguments; raises Refused."""
+    """Returns the checked arguments, or raises Refused."""
     parser = Parser(description=__doc__, formatter_class=argparse.RawDescriptionHelpFormatter)
     actions = parser.add_subparsers(dest="action", required=True)
 
@@ -119,21 +115,21 @@ def parse(arguments):
 
 
 def check_together(settings):
-    """Refuses values that are good by themselves but not with each other."""
+    """Refuses values that are valid by themselves but not together."""
     if settings.dhcp:
         if settings.netmask or settings.gateway:
-            raise Refused("--dhcp goes with no --netmask and no --gateway")
+            raise Refused("--dhcp cannot be combined with --netmask or --gateway")
         return
     if not settings.netmask:
-        raise Refused("--ipaddress wants a --netmask")
+        raise Refused("--ipaddress needs a --netmask")
     network = ipaddress.IPv4Network(f"{settings.ipaddress}/{settings.netmask}", strict=False)
     # Networks of one and two addresses have neither a network address nor a broadcast address.
     if network.num_addresses > 2 and settings.ipaddress in (network.network_address,
                                                             network.broadcast_address):
-        raise Refused(f"{settings.ipaddress} is no host of {network}")
+        raise Refused(f"{settings.ipaddress} is not a host of {network}")
     if settings.gateway and (settings.gateway not in network
                              or settings.gateway == settings.ipaddress):
-        raise Refused(f"gateway {settings.gateway} cannot be reached from {network}")
+        raise Refused(f"the gateway {settings.gateway} cannot be reached from {network}")
 
 
 def stanza(settings):
@@ -148,10 +144,10 @@ def stanza(settings):
 
 
 def with_stanza(text, port, new_stanza):
-    """The interfaces file `text` with the port's IPv4 stanza replaced, or added at the end.
+    """Returns the interfaces file `text` with the port's IPv4 stanza replaced, or added at the end.
 
-    Other stanzas and all comments stay. Every stanza is followed by an empty line, because the
-    panel program takes only that for a stanza's end.
+    Other stanzas and all comments are kept. An empty line follows every stanza, because the panel
+    program takes nothing else for the end of a stanza.
     """
     result = []
     placed = in_stanza = own = automatic = False
@@ -179,7 +175,7 @@ def with_stanza(text, port, new_stanza):
 
 
 def with_servers(text, servers):
-    """The resolver file `text` with its name servers replaced."""
+    """Returns the resolver file `text` with its name servers replaced."""
     kept = [line for line in text.splitlines() if line.split()[:1] != ["nameserver"]]
     return "".join(f"{line}\n" for line in kept + [f"nameserver {server}" for server in servers])
 
@@ -193,8 +189,8 @@ def read(path):
 
 @contextlib.contextmanager
 def replacing(path, text):
-    """Has `text` ready on disk beside `path`; it takes the file's place in one step when the block
-    ends well, and is gone when it does not."""
+    """Writes `text` to disk beside `path`. The new file replaces the old one in one step if the block
+    succeeds, and is removed if it fails."""
     path = path.resolve()
     ready = path.with_name(f".{path.name}.new")
     try:
@@ -214,7 +210,7 @@ def replacing(path, text):
 
 
 def run(*command, **environment):
-    """Runs a tool; what it prints goes to the log, and so does a daemon that it leaves behind."""
+    """Runs a tool. What it prints goes to the log, even from a daemon that it leaves running."""
     logging.info("run: %s", " ".join(command))
     with open(LOG, "ab") as log:
         subprocess.run(command, stdin=subprocess.DEVNULL, stdout=log, stderr=log, check=True,
@@ -223,8 +219,8 @@ def run(*command, **environment):
 
 @contextlib.contextmanager
 def no_other_at_work():
-    """Holds the lock for the block. Nothing that the block starts inherits it: a DHCP client would
-    keep it for ever."""
+    """Holds the lock during the block. Processes started in the block do not inherit it, because a
+    DHCP client would never release it."""
     with open(LOCK, "ab") as lock:
         try:
             fcntl.flock(lock, fcntl.LOCK_EX | fcntl.LOCK_NB)
@@ -241,12 +237,12 @@ def wait_for_lock(lock):
         with contextlib.suppress(BlockingIOError):
             fcntl.flock(lock, fcntl.LOCK_EX | fcntl.LOCK_NB)
             return
-    raise Failed("the other change takes too long")
+    raise Failed("the other change has taken too long")
 
 
 def stop_dhcp_client(port):
     for process in Path("/proc").glob("[0-9]*"):
-        with contextlib.suppress(OSError):  # a process may end while it is looked at
+        with contextlib.suppress(OSError):  # the process may end in the meantime
             words = (process / "cmdline").read_bytes().split(b"\0")
             if not words[0].endswith(b"udhcpc") or port.encode() not in words:
                 continue
@@ -254,7 +250,7 @@ def stop_dhcp_client(port):
             try:
                 signal.pidfd_send_signal(client, signal.SIGTERM)
                 if not select.select([client], [], [], TOOL_TIMEOUT_S)[0]:
-                    raise Failed(f"the DHCP client of {port} does not end")
+                    raise Failed(f"the DHCP client of {port} has not ended")
             finally:
                 os.close(client)
 
@@ -267,7 +263,7 @@ def bring_up_dhcp(settings):
 
 
 def bring_up_static(settings):
-    # Emptied first: an address of an earlier lease would stay beside the new one.
+    # Otherwise the address of an earlier lease would stay beside the new one.
     run("ip", "-4", "addr", "flush", "dev", settings.name)
     run("ifconfig", settings.name, str(settings.ipaddress), "netmask", str(settings.netmask), "up")
     if settings.gateway:
@@ -279,7 +275,7 @@ def apply_iface(settings):
     with contextlib.ExitStack() as files:
         files.enter_context(replacing(
             INTERFACES, with_stanza(read(INTERFACES), settings.name, stanza(settings))))
-        # Without servers of the operator's, a lease brings its own.
+        # If the operator has set no servers, the lease brings its own.
         if settings.dns or not settings.dhcp:
             files.enter_context(replacing(
                 RESOLV_CONF, with_servers(read(RESOLV_CONF), settings.dns)))
