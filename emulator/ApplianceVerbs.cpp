@@ -1,6 +1,7 @@
 #include "emulator/ApplianceVerbs.h"
 
 #include "emulator/Number.h"
+#include "emulator/helpEntry.h"
 
 #include <algorithm>
 #include <arpa/inet.h>
@@ -16,25 +17,26 @@ namespace {
 constexpr int longestHang = 3600; // seconds
 constexpr int longestPrefix = 32;
 
-// In a usage, small letters stand for themselves, capital ones for a value, | between choices.
+// In a usage, words in small letters stand for themselves, words in capital letters for a value,
+// and | separates choices.
 struct Verb {
     std::string_view usage;
     std::string_view help;
 };
 
 constexpr std::array verbs{
-    Verb{"script works|fails|chatters", "what the configuration script does from here on"},
-    Verb{"script hangs SECONDS", "it stands still so long before it does its work"},
-    Verb{"port NAME ADDRESS/PREFIX|-|gone", "the port's address, none, or no such port"},
-    Verb{"hostname NAME", "the host name, also after a reboot"},
-    Verb{"file PATH TEXT", "what the file holds"},
-    Verb{"remove PATH", "there is no such file"},
-    Verb{"refresh", "have the program list the ports anew (SIGUSR1)"},
-    Verb{"reboot", "the program ends and is started afresh"},
-    Verb{"has port NAME ADDRESS/PREFIX|-", "look the port's address up"},
-    Verb{"has gateway ADDRESS PORT", "look the default route up"},
-    Verb{"has hostname NAME", "look the host name up, and what it is after a reboot"},
-    Verb{"has file PATH TEXT", "look whether these lines stand together in the file"},
+    Verb{"script works|fails|chatters", "let the configuration script do this from here on"},
+    Verb{"script hangs SECONDS", "let it wait so long before it does its work"},
+    Verb{"port NAME ADDRESS/PREFIX|-|gone", "set the port's address, or none, or take it away"},
+    Verb{"hostname NAME", "set the host name, also for after a reboot"},
+    Verb{"file PATH TEXT", "write a file that consists of this text"},
+    Verb{"remove PATH", "remove a file"},
+    Verb{"refresh", "have the program list its ports anew"},
+    Verb{"reboot", "end the program and start it again"},
+    Verb{"has port NAME ADDRESS/PREFIX|-", "check that the port has this address, or none"},
+    Verb{"has gateway ADDRESS PORT", "check the default route"},
+    Verb{"has hostname NAME", "check the host name, now and after a reboot"},
+    Verb{"has file PATH TEXT", "check that the file contains these lines together"},
 };
 
 std::vector<std::string> split(std::string_view text, char separator) {
@@ -111,11 +113,8 @@ void checkVerb(const std::vector<std::string> &words) {
 std::string verbsHelp() {
     constexpr std::size_t indent = 35;
     std::string text;
-    for (const Verb &verb : verbs) {
-        std::string line = "  " + std::string(verb.usage);
-        line.resize(indent, ' ');
-        text += line + std::string(verb.help) + "\n";
-    }
+    for (const Verb &verb : verbs)
+        text += helpEntry("  " + std::string(verb.usage), verb.help, indent);
     return text;
 }
 

@@ -55,7 +55,7 @@ Journey::Journey(std::istream &input, std::string itsName, Stage stage) : name(s
     try {
         for (std::string text; readLine(input, text); line++) {
             if (!isText(text))
-                throw std::invalid_argument("this is no text");
+                throw std::invalid_argument("this is not text");
             const std::string_view words = trimmed(text);
             if (!words.empty() && words.front() != '#')
                 add({line, parseStep(words, stage)});

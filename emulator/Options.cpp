@@ -2,6 +2,7 @@
 
 #include "emulator/Number.h"
 #include "emulator/StepTable.h"
+#include "emulator/helpEntry.h"
 
 #include <algorithm>
 #include <array>
@@ -16,7 +17,7 @@ namespace {
 constexpr double shortestLimit = 0.001; // seconds
 constexpr double longestLimit = 86'400;
 
-// An IPv6 address stands in brackets.
+// An IPv6 address is written in brackets.
 boost::asio::ip::tcp::endpoint parseEndpoint(const std::string &text) {
     constexpr unsigned highestPort = 65'535;
     const std::size_t colon = text.rfind(':');
@@ -43,8 +44,8 @@ struct OptionKind {
 
 constexpr std::array optionKinds{
     OptionKind{"journey", "FILE",
-               "play the steps of FILE (- is standard input) instead of\n"
-               "showing the panel on the terminal",
+               "play the steps of FILE, or of standard input if FILE is -,\n"
+               "instead of showing the panel on the terminal",
                [](Options &options, const char *value) { options.journey = value; }},
     OptionKind{"show", nullptr, "also draw the panel on the terminal while a journey is played",
                [](Options &options, const char *) { options.show = true; }},
@@ -55,21 +56,24 @@ constexpr std::array optionKinds{
     OptionKind{"pictures", "DIR", "also write each picture of the journey to DIR/NAME.svg",
                [](Options &options, const char *value) { options.pictures = value; }},
     OptionKind{"limit", "SECONDS",
-               "how long a step of the journey waits for the panel (default 10)",
+               "let a step of the journey wait so long for the panel\n"
+               "(default: 10)",
                [](Options &options, const char *value) {
                    options.limit = seconds(parseNumber(value, shortestLimit, longestLimit,
                                                        "a number of seconds for --limit"));
                }},
-    OptionKind{"fast", nullptr, "show bytes as they come instead of at 2400 baud",
+    OptionKind{"fast", nullptr, "show bytes as soon as they arrive instead of at 2400 baud",
                [](Options &options, const char *) { options.fast = true; }},
     OptionKind{"trace", "FILE",
-               "write a line for each arrival (<) and answer (>) to FILE:\n"
-               "monotonic nanoseconds, direction, bytes in hexadecimal",
+               "write a line to FILE whenever bytes arrive (<) and whenever\n"
+               "a key request is answered (>): the time in nanoseconds, the\n"
+               "direction, and the bytes in hexadecimal",
                [](Options &options, const char *value) { options.trace = value; }},
     OptionKind{"web", "[ADDRESS:]PORT",
                "serve the panel as a page for browsers instead of showing it\n"
-               "on the terminal, and print the page's address; without ADDRESS\n"
-               "to this machine alone; PORT 0 takes a free one",
+               "on the terminal, and print the page's address. Without an\n"
+               "ADDRESS it can be opened on this machine only; PORT 0 stands\n"
+               "for any free port",
                [](Options &options, const char *value) { options.web = parseEndpoint(value); }},
     OptionKind{"help", nullptr, "show this text",
                [](Options &options, const char *) { options.help = true; }},
@@ -83,10 +87,7 @@ std::string optionsHelp() {
         line += kind.name;
         if (kind.value != nullptr)
             line += std::string(" ") + kind.value;
-        line.resize(indent, ' ');
-        for (const char c : kind.help)
-            line += c == '\n' ? "\n" + std::string(indent, ' ') : std::string(1, c);
-        text += line + "\n";
+        text += helpEntry(line, kind.help, indent);
     }
     return text;
 }
@@ -101,13 +102,13 @@ Options Options::parse(int argc, char *const *argv) {
                        static_cast<int>(k)};
     }
     Options options;
-    optind = 1; // start over, whoever parsed before
+    optind = 1; // getopt keeps its place from the last time
     opterr = 0;
     for (;;) {
         const std::string argument = optind < argc ? argv[optind] : "";
         const int found = getopt_long(argc, argv, "+:h", names.data(), nullptr);
         if (found == ':')
-            throw std::invalid_argument(argument + " wants a value");
+            throw std::invalid_argument(argument + " needs a value");
         if (found == '?')
             throw std::invalid_argument("unknown option " + argument);
         if (found == -1)
@@ -121,11 +122,11 @@ Options Options::parse(int argc, char *const *argv) {
     }
     options.command.assign(argv + optind, argv + argc);
     if (options.command.empty())
-        throw std::invalid_argument("no command to start");
+        throw std::invalid_argument("there is no command to start");
     if (options.show && !options.journey)
-        throw std::invalid_argument("--show goes with a --journey");
+        throw std::invalid_argument("--show needs a --journey");
     if (options.show && options.web)
-        throw std::invalid_argument("--show draws on the terminal, --web on a page: give one");
+        throw std::invalid_argument("--show and --web cannot be combined");
     return options;
 }
 
@@ -133,40 +134,41 @@ std::string Options::helpText() {
     return R"(Usage: panel-emulator [OPTION...] -- COMMAND [ARGUMENT...]
 
 Starts COMMAND with an emulated front panel (two rows of 16 characters, four keys)
-on a pseudo-terminal, and ends it when the emulator ends. In the ARGUMENTs, {tty}
-stands for the path of the pseudo-terminal that COMMAND is to open; the
-environment variable PANEL_TTY holds it too. The line is raw, at 2400 baud both
-ways. COMMAND has no terminal of its own, and its standard input is empty.
+at the far end of a pseudo-terminal, and ends it when the emulator ends. In the
+ARGUMENTs, {tty} is replaced by the path of the pseudo-terminal, which the
+environment variable PANEL_TTY contains, too. The line is raw and runs at 2400 baud
+in both directions. COMMAND has no terminal of its own, and its standard input is
+empty.
 
 )" + optionsHelp() +
            R"(
 On the terminal:
   arrow up, arrow down, Enter, Escape    tap the panel's key of that name
-  the same with Shift, or u, d, e, x     hold the key until it is pressed again,
-                                         or any other key is
-  mouse on a drawn key                   the key is down as long as the button is
+  the same with Shift, or u, d, e, x     hold the key until it, or any other key,
+                                         is pressed again
+  mouse on a drawn key                   hold the key as long as the button is held
   q                                      quit
 A key that is typed while the program does not ask for one is forgotten, as on a
-real panel. COMMAND's output is kept back; the last of it is shown if COMMAND ends
-by itself.
+real panel. What COMMAND prints is not shown while it runs; the last lines are
+shown if COMMAND ends by itself.
 
-On the page, a key is down for as long as it is held. Whoever has the page's address
-stands at the panel: it holds a token that is new at each start.
+On the page, a key is down for as long as it is held. The address of the page contains
+a token that is made at each start; whoever has it can use the panel.
 
-A journey has one step a line; # begins a comment. KEY is up, down, enter or
-escape. A word with blanks stands in quotes, with \", \\ and \n for ", \ and a
-line feed. The steps are:
+A journey has one step on each line; # begins a comment. KEY is up, down, enter or
+escape. A word that contains blanks is written in double quotes; in the quotes, \",
+\\ and \n stand for ", \ and a line feed. The steps are:
 )" + stepsHelp(Stage::panel) +
-           R"(PANEL_TTY and PANEL_COMMAND_PID (the process that panel-emulator started) are in
-the environment of the commands that a journey runs.
+           R"(The commands that a journey runs find PANEL_TTY and PANEL_COMMAND_PID, the number of
+the process that panel-emulator has started, in their environment.
 
-These steps can be played in the program's tests only, where time is virtual:
+These steps can be used only in the program's tests, in virtual time:
 )" + stepsHelp(Stage::test) +
            R"(
-Exit status: 0 when the journey was played to its end; 1 when a step failed or
-COMMAND ended too early, or when not everything could be written; 2 for wrong
-usage; 128 + N after signal N. On the terminal and on the page: that of COMMAND if
-it ended by itself; on the terminal, 0 after q.
+The exit status is 0 if the journey was played to its end or q was pressed, 1 if a
+step failed, COMMAND ended before the journey did or not everything could be
+written, 2 if the arguments were wrong, and 128 + N if signal N ended the emulator.
+Without a journey, if COMMAND ends by itself, it is the status of COMMAND.
 )";
 }
 

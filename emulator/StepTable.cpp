@@ -4,6 +4,7 @@
 #include "emulator/Display.h"
 #include "emulator/Font.h"
 #include "emulator/Number.h"
+#include "emulator/helpEntry.h"
 
 #include <algorithm>
 #include <stdexcept>
@@ -42,14 +43,14 @@ Word takeQuoted(std::string_view &rest) {
         }
         at++;
         if (at < rest.size() && std::string_view("\"\\n").find(rest[at]) == std::string_view::npos)
-            reject("in quotes a backslash stands before \", \\ or n only");
+            reject("in quotes, a backslash can only be followed by \", \\ or n");
         if (at < rest.size())
             word.text += rest[at] == 'n' ? '\n' : rest[at];
     }
     reject("a quote is not closed");
 }
 
-// What stands behind a step's name: words, taken one after the other, or the rest of the line.
+// What follows a step's name: words, which are taken one after the other, or the rest of the line.
 class Arguments {
   public:
     explicit Arguments(std::string_view text) : rest(text) { skipBlanks(); }
@@ -74,7 +75,7 @@ class Arguments {
             rest.remove_prefix(end);
         }
         if (!rest.empty() && blanks.find(rest.front()) == std::string_view::npos)
-            reject("a blank is missing behind a quote");
+            reject("there is no blank after a quoted word");
         skipBlanks();
         return word.text;
     }
@@ -105,9 +106,9 @@ class Arguments {
     std::string takeRow() {
         std::string row = take();
         if (row.size() > Display::visibleColumns)
-            reject("\"" + row + "\" is wider than a row");
+            reject("\"" + row + "\" is longer than a row");
         if (!std::all_of(row.begin(), row.end(), isPrintable))
-            reject("\"" + row + "\" can never be seen: the panel shows printable ASCII");
+            reject("\"" + row + "\" can never be seen: the panel shows only printable ASCII");
         row.resize(Display::visibleColumns, ' ');
         return row;
     }
@@ -213,7 +214,7 @@ Action parsePicture(Arguments &words) {
         name.find_first_not_of("abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ"
                                "0123456789-_.") == std::string::npos;
     if (!isPlain || name.empty() || name.front() == '.')
-        reject("'" + name + "' is no name for a picture: letters, digits, - _ and .");
+        reject("'" + name + "' is not a name for a picture: use letters, digits, - _ and .");
     return step::TakePicture{name};
 }
 
@@ -281,59 +282,67 @@ struct StepKind {
 
 constexpr std::array stepKinds{
     StepKind{"tap", "KEY [N] [until \"ROW 0\" [\"ROW 1\"]]",
-             "press KEY for exactly one key request, N times; each tap ends when a\n"
-             "whole poll has gone by without the key. With until, stop as soon as\n"
-             "the panel shows this, and fail after N taps (100 if not given)",
+             "press KEY for exactly one key request, and wait until a whole poll\n"
+             "has gone by without it; do this N times. With until, stop as soon\n"
+             "as the panel shows these rows, and fail after N taps (default: 100)",
              Stage::panel, parseTap},
     StepKind{"keys", "LETTERS...",
-             "press many keys: u, d, e and x are taps of up, down, enter and escape;\n"
-             "a number behind a letter holds the key for that many key requests",
+             "tap many keys: u, d, e and x stand for up, down, enter and escape.\n"
+             "With a number behind its letter, a key is held for that many key\n"
+             "requests",
              Stage::panel, parseKeys},
     StepKind{"hold", "KEY POLLS",
-             "press KEY and wait until it has answered that many key requests; it\n"
-             "stays down, so that another hold counts on",
+             "press KEY and wait until it has answered that many key requests;\n"
+             "the key stays down, and another hold goes on counting",
              Stage::panel, parseHold},
-    StepKind{"release", "", "let go, and wait until a whole poll has gone by without a key",
+    StepKind{"release", "",
+             "let the key come up, and wait until a whole poll has gone by without\n"
+             "it",
              Stage::panel, parseRelease},
-    StepKind{"wait", "SECONDS", "let time pass", Stage::panel, parseWait},
+    StepKind{"wait", "SECONDS", "let this time pass", Stage::panel, parseWait},
     StepKind{"expect", "\"ROW 0\" [\"ROW 1\"]",
              "wait until the panel shows these rows, each filled up with blanks;\n"
-             "without ROW 1 any second row will do",
+             "if ROW 1 is not given, the second row may be anything",
              Stage::panel, parseExpect},
     StepKind{"expect-cursor", "ROW COLUMN on|off",
-             "wait until the cursor is there, blinking or not", Stage::panel, parseExpectCursor},
-    StepKind{"picture", "NAME", "print the panel, with v or ^ at a blinking cursor", Stage::panel,
-             parsePicture},
+             "wait until the cursor is there, and blinks or does not", Stage::panel,
+             parseExpectCursor},
+    StepKind{"picture", "NAME", "print what the display shows, with v or ^ at a blinking cursor",
+             Stage::panel, parsePicture},
     StepKind{"say", "TEXT", "print the rest of the line", Stage::panel, parseSay},
-    StepKind{"limit", "SECONDS", "how long each step from here on waits for the panel",
+    StepKind{"limit", "SECONDS", "let each step from here on wait so long for the panel",
              Stage::panel, parseLimit},
     StepKind{"run", "COMMAND",
-             "have /bin/sh run the rest of the line; it has to end with status 0\n"
-             "within 60 s, and what it leaves running is ended with it",
+             "have /bin/sh run the rest of the line, which has to end with status 0\n"
+             "within 60 seconds; whatever it leaves running is ended",
              Stage::panel, parseRun},
     StepKind{"appliance", "VERB...",
-             "have something happen at the appliance that the program runs on, or\n"
-             "look something up there, by the verbs below",
+             "change something at the appliance that the program runs on, or check\n"
+             "something there, with one of the verbs below",
              Stage::panel, parseAppliance},
     StepKind{"scene", "TITLE",
              "set up a fresh appliance, whose program starts at the next step that is\n"
              "not about the appliance",
              Stage::test, parseScene},
     StepKind{"prints", "\"COMMAND\" \"OUTPUT\"",
-             "what this command line of the program prints from here on", Stage::test, parsePrints},
+             "from here on let this command line of the program print this", Stage::test,
+             parsePrints},
     StepKind{"answer", "HEX...",
-             "the panel's next answer is just these bytes; 20*40 is 20 forty times", Stage::test,
-             parseAnswer},
+             "let the program read these bytes in place of the panel's next answer;\n"
+             "20*40 means the byte 20 forty times",
+             Stage::test, parseAnswer},
     StepKind{"expect-sent", "[HEX...]",
-             "just these bytes have been sent since the last step that pressed a key;\n"
-             "key requests are left out",
+             "check that, apart from key requests, just these bytes have been sent\n"
+             "since the last step that pressed a key",
              Stage::test, parseExpectSent},
     StepKind{"expect-pause", "SECONDS \"ROW 0\" [\"ROW 1\"]",
-             "the next pause in which no key was read, and what it was made behind", Stage::test,
-             parseExpectPause},
+             "check how long the next pause was in which no key was read, and what\n"
+             "the panel showed in the meantime",
+             Stage::test, parseExpectPause},
     StepKind{"expect-run", "\"COMMAND\" \"ROW 0\" [\"ROW 1\"]",
-             "the next run of the configuration script, and what it was made behind", Stage::test,
-             parseExpectRun},
+             "check the command line of the configuration script's next run, and what\n"
+             "the panel showed in the meantime",
+             Stage::test, parseExpectRun},
 };
 
 std::string usage(const StepKind &kind) {
@@ -350,7 +359,8 @@ Action parseStep(std::string_view line, Stage stage) {
     if (kind == stepKinds.end())
         reject("'" + std::string(name) + "' is not a step");
     if (kind->stage == Stage::test && stage != Stage::test)
-        reject("'" + std::string(name) + "' can be played in tests only, in virtual time");
+        reject("'" + std::string(name) +
+               "' can be used only in the program's tests, in virtual time");
     Arguments arguments(line.substr(name.size()));
     std::string complaint;
     try {
@@ -367,14 +377,8 @@ std::string stepsHelp(Stage stage) {
     constexpr std::size_t indent = 21;
     std::string text;
     for (const StepKind &kind : stepKinds) {
-        if (kind.stage != stage)
-            continue;
-        std::string line = "  " + usage(kind);
-        line += line.size() < indent - 1 ? std::string(indent - line.size(), ' ')
-                                         : "\n" + std::string(indent, ' ');
-        for (const char c : kind.help)
-            line += c == '\n' ? "\n" + std::string(indent, ' ') : std::string(1, c);
-        text += line + "\n";
+        if (kind.stage == stage)
+            text += helpEntry("  " + usage(kind), kind.help, indent);
     }
     return text + (stage == Stage::panel ? "The appliance's verbs are:\n" + verbsHelp() : "");
 }

@@ -11,7 +11,7 @@ namespace {
 constexpr int exitFailed = 1;
 constexpr int exitUsage = 2;
 
-// A message may quote what somebody else has written, and must not act on the terminal.
+// A message may quote what somebody else has written, which must not control the terminal.
 int complain(int status, const std::string &message) {
     std::cerr << "panel-emulator: ";
     for (const char c : message)
@@ -21,8 +21,8 @@ int complain(int status, const std::string &message) {
     return status;
 }
 
-// The line must not become one of the standard descriptors. Those that are closed are taken by
-// something that can be neither written nor read, as a closed one is.
+// The pseudo-terminal must not become one of the standard descriptors. Those that are closed are
+// taken by something that can be neither written nor read, just like a closed one.
 void occupyStandardDescriptors() {
     int taken = 0;
     while (taken <= STDERR_FILENO && taken >= 0)
@@ -56,8 +56,9 @@ int main(int argc, char **argv) {
         if (options.journey)
             journey = readJourney(*options.journey);
         if (options.isDrawn() && (!isatty(STDIN_FILENO) || !isatty(STDOUT_FILENO)))
-            throw std::invalid_argument(journey ? "not on a terminal: nothing to --show it on"
-                                                : "not on a terminal: give a --journey or --web");
+            throw std::invalid_argument(journey
+                                            ? "--show needs a terminal to draw on"
+                                            : "this is not a terminal: give --journey or --web");
         if (options.pictures)
             std::filesystem::create_directories(*options.pictures);
     } catch (const std::exception &error) {

@@ -113,7 +113,7 @@ class WithoutTerminal(unittest.TestCase):
                 (1, "trace", "tap up", ["--trace", "/dev/full"], KEYS),
                 (2, "no step in it", "", [], "true"),
                 (2, "too long", "x" * 100_000, [], "true"),
-                (2, "no text", "say \033[2J", [], "true"),
+                (2, "not text", "say \033[2J", [], "true"),
                 (2, "from 0.001 to 86400", "release", ["--limit", "0"], "true"),
                 (2, "unknown option -fast", "release", ["-fast"], "true"),
                 (2, "not an [ADDRESS:]PORT", "release", ["--web", "::1:80"], "true"),
