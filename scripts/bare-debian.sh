@@ -1,13 +1,13 @@
-# Sourced: a bare Debian 12 to throw away, copied from one that is kept.
+# The scripts source this file for a throw-away copy of a bare Debian 12.
 
-# bare_debian FOLDER NAME [OPTION...]: makes FOLDER, which must not exist, a copy of the system that
-# debootstrap made with these options and that is kept under this name. For root.
+# bare_debian FOLDER NAME [OPTION...]: copies a bare system to FOLDER, which must not exist. The system
+# is made by debootstrap with these options, and kept under this name. Only root can do this.
 bare_debian() {
     new=$1
     kept=${XDG_CACHE_HOME:-$HOME/.cache}/kestrova-panel/$2
     shift 2
     [ -d "$kept" ] || {
-        # An interrupted one must not be taken for a whole one.
+        # An interrupted debootstrap must not leave something that looks complete.
         rm -rf "$kept.part" &&
             mkdir -p "${kept%/*}" &&
             debootstrap --variant=minbase "$@" bookworm "$kept.part" &&

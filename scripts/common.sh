@@ -1,14 +1,14 @@
-# Sourced by the scripts, from the checkout's folder: steps that show what they do, and builds.
-# $me is the script's name for what it says.
+# The scripts source this file in the checkout's folder. It contains steps that show what they do, and
+# builds. $me is the name of the script, which begins its messages.
 
-# What the present step printed: a file that has no name any more.
+# What the current step has printed. The file no longer has a name, so it disappears with the script.
 printed=$(mktemp) || exit 1
 exec 8>"$printed"
 rm "$printed"
 printed=/dev/fd/8
 
-# step TITLE COMMAND: in a log one line when all is well, and everything that COMMAND printed when
-# not; on a terminal COMMAND's own lines show that it moves. Sets $seconds.
+# step TITLE COMMAND: runs COMMAND, and sets $seconds to the time it took. A log gets one line if
+# COMMAND succeeds, and everything that it printed if not. A terminal shows its lines as they come.
 step() {
     title=$1
     shift
@@ -29,10 +29,10 @@ step() {
     printf '%-40s ok, %d s\n' "$title" $seconds
 }
 
-# Indents what the step told beyond its result, where a terminal has not shown it: sed's script.
+# and_tell SCRIPT: prints what sed's script takes from the step's output, unless a terminal showed it.
 and_tell() { [ -t 1 ] || sed -n "$1" $printed | sed 's/^/    /'; }
 
-# in_build FOLDER COMMAND: one at a time, and only where everything can be written.
+# in_build FOLDER COMMAND: runs COMMAND if everything in the folder can be written, one at a time.
 in_build() {
     build=$1
     shift
@@ -49,7 +49,8 @@ in_build() {
     { flock 9 && "$@"; } 9<"$build"
 }
 
-# configure FOLDER ARGUMENT...: with Ninja, anew when the folder was moved, copied or made otherwise.
+# configure FOLDER ARGUMENT...: configures a build with Ninja, from scratch if the folder was moved or
+# copied, or made with another generator.
 configure() {
     build=$1
     shift
@@ -69,5 +70,5 @@ compile() {
         cmake --build --preset "$preset" -j"$(nproc)" ${1:+--target "$@"}
 }
 
-# Also root may ask, in somebody else's checkout.
+# Root may ask in somebody else's checkout, too.
 ask_git() { git -c safe.directory="$PWD" "$@"; }
