@@ -12,9 +12,9 @@ class MenuContext;
 class NetworkConfig;
 
 /// What the four address screens have in common: an address on row 1, with the cursor blinking on
-/// the last digit of one octet. Up and Down change that octet; Enter walks on and, on the last
-/// octet, stores the address; Escape walks back and, on the first, leaves without storing. Which
-/// address it is, and where the screen leads, is said by an `EditedAddress`.
+/// the last digit of one octet. Up and Down change that octet; Enter goes on and, on the last
+/// octet, stores the address; Escape goes back and, on the first, leaves without storing. An
+/// `EditedAddress` says which address it is and where the screen leads.
 class AddressEditor {
   public:
     AddressEditor(Menu *screen, const EditedAddress &edited);

@@ -1,4 +1,4 @@
-// Between the text of an IPv4 address and its four octets.
+// Conversions between the text of an IPv4 address and its four octets.
 #pragma once
 
 #include <array>

@@ -4,7 +4,7 @@
 #include "runtime/DrawnOnce.h"
 #include "runtime/Menu.h"
 
-/// Asks whether a DNS server is to be edited or deleted. A deletion is not asked about again.
+/// Asks whether a DNS server is to be edited or deleted. A deletion is not confirmed.
 class IfaceStaticDNSActionMenu : public Menu {
   public:
     static IfaceStaticDNSActionMenu *instance() {

@@ -4,8 +4,8 @@
 
 namespace {
 
-// Opens the panel before `main`: a line that cannot be configured ends the process before anything
-// is drawn or any signal handled.
+// Opens the panel before `main`, so that a line that cannot be configured ends the process before
+// anything is drawn and before any signal is handled.
 LcdPanel *const panel = LcdPanel::instance();
 
 constexpr std::int64_t octetValues = 256;

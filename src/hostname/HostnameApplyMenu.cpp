@@ -37,7 +37,8 @@ void HostnameApplyMenu::display(MenuContext *) {
         panel->showText(confirmationText);
 }
 
-// No hold filter: the screen is left at once, and an Escape that goes on does no harm to the pages.
+// No hold filter is needed: the screen is left at once, and Escape does no harm on the status
+// pages.
 void HostnameApplyMenu::onEscape(MenuContext *context) {
     drawn.leaveFor(context, MainMenu::instance());
 }

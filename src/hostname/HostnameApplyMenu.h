@@ -22,10 +22,10 @@ class HostnameApplyMenu : public Menu {
     void onEscape(MenuContext *context) override;
     void onEnter(MenuContext *context) override;
 
-    /// Neither begins nor ends with a hyphen, and does not begin with a digit. For a name that is
-    /// not empty.
+    /// True for a name that neither begins nor ends with a hyphen and does not begin with a digit.
+    /// The name must not be empty.
     [[nodiscard]] bool isValidHostname() const;
-    /// Starts the configuration script, and forgets the name: a further Enter applies nothing.
+    /// Starts the configuration script, and forgets the name: another Enter applies nothing.
     void applyHostname();
 
   private:

@@ -115,7 +115,7 @@ void HostnameEditMenu::eraseAndStepBack() {
     }
 }
 
-// The first Down on the new position is to give "a", so it starts as if from the hyphen.
+// A new position starts from the hyphen, the last character, so that the first Down gives "a".
 void HostnameEditMenu::stepOn() {
     panel->cursorRight();
     ++cursorPos;

@@ -22,6 +22,6 @@ void IfaceDHCPApplyMenu::onEnter(MenuContext *context) {
         return;
     panel->showText("Applying\nDHCP Settings");
     if (config != nullptr)
-        config->apply(); // the port's page tells the outcome
+        config->apply(); // the page of the port shows the outcome
     drawn.leaveFor(context, MainMenu::instance());
 }

@@ -5,8 +5,8 @@
 
 class NetworkConfig;
 
-/// Asks for confirmation before a port is switched to DHCP. Whatever comes of it, the panel goes
-/// back to the status pages: there the port shows whether it got an address.
+/// Asks for confirmation before a port is switched to DHCP. Whether that succeeds or not, the
+/// panel goes back to the status pages, where the port shows whether it has got an address.
 class IfaceDHCPApplyMenu : public Menu {
   public:
     static IfaceDHCPApplyMenu *instance() {

@@ -12,7 +12,7 @@ bool contains(const std::string &line, const char *word) {
     return line.find(word) != std::string::npos;
 }
 
-// The whole line when it holds no space.
+// Returns the whole line if it contains no space.
 std::string afterLastSpace(const std::string &line) {
     return line.substr(line.rfind(' ') + 1);
 }
@@ -75,8 +75,8 @@ std::string NetworkConfig::apply() const {
         return "Invalid Netmask";
 
     const std::string options = (dhcp ? " --dhcp" : staticOptions()) + dnsOptions();
-    // Cannot happen, as each way above gives an option. The guard keeps a later change from running
-    // the script without any.
+    // This cannot happen, because each way above gives an option. The guard keeps a later change
+    // from running the script without options.
     if (options.empty())
         return "Unknown";
 

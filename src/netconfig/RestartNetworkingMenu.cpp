@@ -28,7 +28,7 @@ void RestartNetworkingMenu::display(MenuContext *context) {
         leave(context);
 }
 
-// No key has a hold filter: whatever is pressed gives up the wait, also when it was down before.
+// No key has a hold filter: any key ends the wait, even one that was down before.
 void RestartNetworkingMenu::onUp(MenuContext *context) {
     leave(context);
 }

@@ -21,7 +21,7 @@ class HeldKeys {
     static constexpr std::uint32_t lastShortPoll = 5;
     static constexpr std::uint32_t firstLongPoll = 6;
 
-    std::uint32_t upHeld = 0; // these four: consecutive polls, at most one of them not 0
+    std::uint32_t upHeld = 0; // consecutive polls of each key; at most one of the four is not 0
     std::uint32_t downHeld = 0;
     std::uint32_t escapeHeld = 0;
     std::uint32_t enterHeld = 0;

@@ -29,8 +29,8 @@ KeyCode keyOfAnswer(std::uint8_t byte) {
 
 } // namespace
 
-// The first initialisation may be lost on a panel that was left in the middle of a command: it
-// takes the bytes for the rest of that one. So it is sent twice.
+// A panel that was left in the middle of a command takes the first initialisation for the rest of
+// that command. The initialisation is therefore sent twice.
 LcdPanel::LcdPanel() : commandPrefix(PanelCommand::prefix) {
     sendCommand(PanelCommand::initialise);
     sendCommand(PanelCommand::initialise);
@@ -81,7 +81,7 @@ void LcdPanel::cursorOff() {
 
 int LcdPanel::showText(QLX::String<char> text) {
     clear();
-    text += "\n "; // there is always a second line, blank if need be
+    text += "\n "; // so that there always is a second line
     const auto lines = splitString(text, "\n");
     writeRow(lines[0]);
     setCursor(1, 0);
@@ -90,7 +90,8 @@ int LcdPanel::showText(QLX::String<char> text) {
     return std::max(0, static_cast<int>(lines[1].length()) - visibleColumns);
 }
 
-// One write for the whole row. It leaves the cursor behind the row, and all rows equally long.
+// Writes the whole row at once, which leaves the cursor behind the row and makes all rows equally
+// long.
 void LcdPanel::writeRow(const std::string &text) {
     line.send((text + linePad).data(), visibleColumns);
 }

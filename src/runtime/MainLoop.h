@@ -6,7 +6,7 @@ class LcdPanel;
 class Menu;
 class MenuContext;
 
-/// The program's spine: one key, one drawing, one short sleep, for ever.
+/// The loop that drives the program: one key, one drawing and one short sleep, for ever.
 class MainLoop {
   public:
     /// Has every `SIGUSR1` call `requestRefresh`, and then makes what `firstScreen` returns the

@@ -3,11 +3,11 @@
 #include <cstdint>
 #include <string>
 
-/// A text that goes round and round through a row too short for it: the text, a gap of three
-/// blanks, and the text again.
+/// A text that scrolls round and round through a row that is too short for it: the text, a gap of
+/// three blanks, and the text again.
 class Marquee {
   public:
-    /// Begins anew with this text, at its first character.
+    /// Begins again, with the first character of this text.
     void start(const std::string &text);
     /// Replaces the text and keeps the place that it has been scrolled to.
     void setText(const std::string &text) { marqueeText = text; }

@@ -8,7 +8,8 @@ class MenuContext;
 /// values between visits.
 class Menu {
   public:
-    /// Called on every turn of the main loop, after the key: must be cheap when nothing changed.
+    /// Is called on every turn of the main loop, after the key, and so must be cheap if nothing has
+    /// changed.
     virtual void display(MenuContext *context);
     virtual void onUp(MenuContext *context);
     virtual void onDown(MenuContext *context);

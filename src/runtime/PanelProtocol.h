@@ -1,8 +1,8 @@
 // Every byte value that the panel and the program agree on, in one table.
 //
-// The panel acknowledges nothing and cannot be asked what it has understood. So what looks needless
-// here stays as every panel in the field has been driven: the command before each key request, and
-// the way round into row 1.
+// The panel acknowledges nothing and cannot be asked what it has understood. Two things that look
+// needless are therefore kept as every panel in the field has been driven: the command before each
+// key request, and the detour into row 1.
 #pragma once
 
 #include <cstdint>

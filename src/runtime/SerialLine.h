@@ -7,14 +7,14 @@
 
 /// The serial line to the panel, `/dev/ttyS1`: raw bytes at 2400 baud.
 ///
-/// The line is never waited for when writing: what cannot be written is lost, silently.
+/// Writing never waits for the line: what cannot be written is silently lost.
 class SerialLine {
   public:
-    /// What one look at the line has brought; 0 where nothing came.
+    /// The bytes that one look at the line has brought, and 0 after the last of them.
     using Received = std::array<std::uint8_t, 256>;
 
-    /// Opens and configures the line. Ends the process with status 150 when it cannot be
-    /// configured. A line that cannot be opened is not noticed: writing and reading then fail.
+    /// Opens and configures the line, and ends the process with status 150 if it cannot be
+    /// configured. That it cannot be opened is not noticed: writing and reading then fail.
     SerialLine();
     ~SerialLine();
     SerialLine(const SerialLine &) = delete;

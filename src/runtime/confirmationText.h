@@ -1,4 +1,4 @@
 #pragma once
 
-/// What every screen shows that asks before it applies something.
+/// What a screen shows that asks before it applies something.
 constexpr const char *confirmationText = "ESC   - Cancel\nENTER - Apply";

@@ -3,7 +3,7 @@
 #include <chrono>
 #include <unistd.h>
 
-/// Stands still, keys and display included. A signal cuts the pause short.
+/// Does nothing for this time, not even for the keys and the display. A signal cuts it short.
 inline void pauseFor(std::chrono::microseconds time) {
     usleep(static_cast<useconds_t>(time.count()));
 }

@@ -23,7 +23,8 @@ std::string captureOutput(const char *command) {
     return output;
 }
 
-// The command substitution makes the shell itself wait for the command, away from the panel.
+// The command substitution makes a shell in the background wait for the command, so that the panel
+// does not have to.
 void startInBackground(const char *command) {
     const std::string line = std::string("`") + command + "` &";
     [[maybe_unused]] const int status = system(line.c_str());

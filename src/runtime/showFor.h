@@ -5,5 +5,5 @@
 
 class LcdPanel;
 
-/// Shows a text that the operator has to have time to read: no key is read meanwhile.
+/// Shows a text for as long as the operator needs to read it. No key is read in the meantime.
 void showFor(LcdPanel *panel, std::chrono::seconds time, const std::string &text);

@@ -21,7 +21,7 @@ void MainMenu::requestRefresh() {
 
 void MainMenu::refresh() {
     rotation.startAgain();
-    refreshRequested = 0; // before the rebuild: a request that comes during it is not lost
+    refreshRequested = 0; // before the rebuild, so that a request that comes during it is not lost
     rebuildPages();
 }
 
@@ -79,14 +79,14 @@ void MainMenu::showPageAskedFor(const std::string &text) {
     rotation.pageChosen(panel->showText(text));
 }
 
-// No hold filter: a second time changes nothing.
+// No hold filter is needed: doing this again changes nothing.
 void MainMenu::onEscape(MenuContext *) {
     rotation.resume();
 }
 
 // The filter stops only long holds, so each of the first five polls of a hold opens the page. A
 // press that begins here opens it on its first poll. An Enter that is still down after an apply
-// opens the port again on its second. Whoever holds the key for longer opens nothing more.
+// opens the port again on its second poll. A key that is held for longer opens nothing more.
 void MainMenu::onEnter(MenuContext *context) {
     if (panel->isHeldLong(keyEnter))
         return;
@@ -96,9 +96,9 @@ void MainMenu::onEnter(MenuContext *context) {
         enterSubmenu(context, page.settings(name));
 }
 
-// One page back, so that the operator's return advances to the page that was left and shows it
-// afresh. The text of the page before it is computed and thrown away: there is no stepping without
-// computing, and its commands cost the operator nothing but a moment after a key.
+// Goes back by one page, so that the operator's return advances to the page that was left, and
+// shows it afresh. Stepping always computes a text, so that of the page before is computed and
+// thrown away; its commands delay the operator only for a moment after the key.
 void MainMenu::enterSubmenu(MenuContext *context, Menu *menu) {
     rotation.startAgain();
     previousPage();

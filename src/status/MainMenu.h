@@ -10,8 +10,8 @@
 
 /// The status display that the panel shows when nobody works on it, and to which every other screen
 /// returns: one page after the other, by itself or with Up and Down. Enter leads from the host
-/// name's and the ports' pages into their settings. Which pages there are, what they show and what
-/// Enter opens on them is said by the table in `StatusPage`.
+/// name's and the ports' pages into their settings. The table in `StatusPage` says which pages
+/// there are, what they show, and what Enter opens on them.
 class MainMenu : public Menu {
   public:
     static MainMenu *instance() {
@@ -30,7 +30,8 @@ class MainMenu : public Menu {
     void onEscape(MenuContext *context) override;
     void onEnter(MenuContext *context) override;
 
-    /// Lists the pages anew. The current page becomes the last: the first is shown next.
+    /// Lists the pages again. The last page becomes the current one, so that the first is shown
+    /// next.
     void rebuildPages();
     /// Adds the pages of the network ports that have one.
     void appendInterfacePages();

@@ -13,8 +13,8 @@ namespace {
 // drops the line: virtual interfaces of every kind stay off the panel. The shell's `echo` has to
 // turn backslash-n into a line feed.
 //
-// Whoever traces the program's commands on an appliance knows this one by its text, the runs of
-// blanks included. Its length is asserted because a lost blank would change nothing else.
+// Those who trace the program's commands on an appliance recognise this one by its text, including
+// the runs of blanks. Its length is asserted because nothing else would reveal a lost blank.
 constexpr std::string_view listCommand =
     "echo \"`ifconfig -s |       sed 1d |       egrep -v 'lo|ani|docker|v|ipsec_|ssl_' |"
     "       awk '{ print $1 } '`\\neth4\\neth5\" |       sort -u | tr '\n' ','";
@@ -37,7 +37,7 @@ constexpr std::array<PrefixLabel, 8> labels = {{
     {"eth7", "E7"},
 }};
 
-// These two are on every appliance's front, whether or not the system knows them.
+// These two are on the front of every appliance, whether the system knows them or not.
 bool alwaysHasPage(const std::string &name) {
     return name == "eth4" || name == "eth5";
 }

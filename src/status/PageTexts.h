@@ -10,8 +10,8 @@
 
 [[nodiscard]] std::string hostnameText();
 
-/// Which management server the appliance is connected to. Any file that is missing or does not say
-/// so reads as no server.
+/// Which management server the appliance is connected to. A file that is missing, or says nothing
+/// about it, means that there is no server.
 [[nodiscard]] std::string connectionText();
 
 /// A port's label and name, and its address or the reason why there is none.

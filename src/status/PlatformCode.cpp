@@ -10,7 +10,8 @@ PlatformCode detectPlatform() {
     std::string line;
     std::getline(file, line);
 
-    // A q700 is served as a q70, whose prefix it shares; the order decides and must stay.
+    // A q700 counts as a q70, because its name begins with "q70". The order of these lines must
+    // stay.
     if (beginsWith(line, "q70"))
         return platformQ70;
     if (beginsWith(line, "zvm"))

@@ -18,7 +18,8 @@ void RotationTimer::pageTurned(int excess, const ACE_Time_Value &now) {
     restartScrolling(excess, now);
 }
 
-// The page's time and the row's are two readings of the clock: one that fails spoils only its own.
+// The clock is read separately for the page and for the row, so that a reading that fails spoils
+// only one of the two times.
 void RotationTimer::pageChosen(int excess) {
     pageInterval = manualPageInterval;
     lastPageChange = ACE_OS::gettimeofday();
@@ -29,9 +30,9 @@ void RotationTimer::resume() {
     pageInterval = autoPageInterval;
 }
 
-// Each step of a row that has still to be read restarts the page's time. The last one does not: the
-// row goes round until the page's time is over, and a row that is too long by one never holds up
-// the rotation.
+// Each step restarts the page's time as long as a part of the row has not been shown yet. The last
+// step does not: the row scrolls on until the page's time is over, and a row that is too long by
+// one character never delays the rotation.
 void RotationTimer::scrolled(const ACE_Time_Value &now) {
     if (scrollSteps >= 2) {
         --scrollSteps;

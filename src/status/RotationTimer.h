@@ -6,9 +6,9 @@
 
 /// Decides when the status display shows its next page and when a long second row moves on.
 ///
-/// It is asked once per turn of the main loop, and without a key a turn takes 600 ms: an interval
-/// ends with the first turn after it, so that the 0.9 s between two scroll steps are 1.2 s unless
-/// keys make the turns shorter.
+/// It is asked once per turn of the main loop, and without a key a turn takes 600 ms. An interval
+/// lasts until the first turn after it, so that the 0.9 s between two scroll steps become 1.2 s
+/// unless keys make the turns shorter.
 class RotationTimer {
   public:
     /// The next page is due at once.
@@ -18,8 +18,8 @@ class RotationTimer {
     void pageTurned(int excess, const ACE_Time_Value &now);
     /// The operator has paged by hand, and gets a minute to read before the rotation goes on.
     void pageChosen(int excess);
-    /// The operator does not need the minute: the page's ordinary time counts from when it was
-    /// drawn.
+    /// The operator does not need the minute: the page's ordinary time counts, from the moment at
+    /// which it was drawn.
     void resume();
     /// The second row has moved by one character.
     void scrolled(const ACE_Time_Value &now);
