@@ -1,6 +1,6 @@
-// What a journey can have happen at the appliance, or look up there, as a table. The box does it
-// beside a program that runs in real time, the tests' appliance in virtual time; both know the same
-// verbs, and a wrong one is refused before anything starts.
+// A table of what a journey can change or check at the appliance. The box does it while the program
+// runs in real time, and the tests' appliance does it in virtual time. Both know the same verbs,
+// and a wrong one is refused before anything starts.
 #pragma once
 
 #include <string>
@@ -8,7 +8,7 @@
 
 namespace emulator {
 
-/// Throws std::invalid_argument with what is wrong when the appliance does not know these words.
+/// Throws std::invalid_argument with what is wrong if the appliance does not know these words.
 void checkVerb(const std::vector<std::string> &words);
 
 /// Each verb's usage and what it does, for `--help`.

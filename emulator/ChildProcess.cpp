@@ -25,10 +25,10 @@ int shellStatus(int raw) {
     return WIFEXITED(raw) ? WEXITSTATUS(raw) : 128 + WTERMSIG(raw);
 }
 
-// Has this process ended, as if by SIGTERM, when `parent` has.
+// Makes the kernel send SIGTERM to this process when `parent` has ended.
 void endWith(pid_t parent) {
     prctl(PR_SET_PDEATHSIG, SIGTERM);
-    // The parent may have gone before it was asked to tell of its end.
+    // The parent may have ended before this request.
     if (getppid() != parent)
         _exit(cannotRun);
 }
@@ -49,7 +49,7 @@ void endWith(pid_t parent) {
     _exit(cannotRun);
 }
 
-// Waits until the command and its group have ended; SIGTERM makes it end them, as far as it can: a
+// Waits until the command and its group have ended, and ends them at SIGTERM as far as possible: a
 // process that has become root cannot be killed, and a zombie whose parent has left the group
 // stays.
 int waitForGroup(pid_t command, const sigset_t &awaited) {
@@ -73,18 +73,19 @@ int waitForGroup(pid_t command, const sigset_t &awaited) {
             kill(-command, SIGKILL);
         }
         if (giveUp && Clock::now() >= *giveUp + killPeriod)
-            kill(getpid(), SIGKILL); // which is how the emulator can tell
+            kill(getpid(), SIGKILL); // which tells the emulator
     }
 }
 
 [[noreturn]] void guardCommand(std::vector<std::string> &command, int output, int report,
                                pid_t parent) {
-    // Nothing but SIGKILL ends the guard before the command. Blocked ahead of anything else so
-    // that no request to end the command gets lost.
+    // Nothing but SIGKILL ends the guard before the command. The signals are blocked before
+    // anything else, so that no request to end the command gets lost.
     sigset_t all;
     sigfillset(&all);
     sigprocmask(SIG_BLOCK, &all, nullptr);
-    // The emulator's handlers would swallow a signal that comes before the command's own start.
+    // Otherwise the emulator's handlers would swallow a signal that comes before the command
+    // starts.
     for (int number = 1; number < NSIG; number++)
         signal(number, SIG_DFL);
     endWith(parent);
@@ -100,7 +101,7 @@ int waitForGroup(pid_t command, const sigset_t &awaited) {
     if (pid == 0)
         become(command, self);
     if (pid > 0)
-        setpgid(pid, pid); // as the command does: whoever comes first, the group exists from here
+        setpgid(pid, pid); // as the command does too, so that the group exists from here on
     if (write(report, &pid, sizeof pid) < 0 || pid < 0)
         _exit(cannotRun);
     // The line must hang up with the emulator, not with the guard.
@@ -128,7 +129,7 @@ ChildProcess::ChildProcess(Loop &loop, std::vector<std::string> words, int outpu
     if (guard < 0 || read(pidReport.get(), &command, sizeof command) != sizeof command ||
         command < 0)
         throw std::system_error(errno, std::generic_category(), "cannot start a process");
-    // By number: the C library's header for it does not serve C++.
+    // By its number, because the C library's header for it cannot be used in C++.
     guardEnd = FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, guard, 0)));
     guardEndWait = std::make_unique<Readable>(loop, guardEnd.get(), [this] { status(); });
 }

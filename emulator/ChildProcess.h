@@ -14,7 +14,8 @@ namespace emulator {
 
 /// A command that runs beside the emulator, in a session and process group of its own, and ends
 /// with it at the latest: when this object is destroyed, and also when the emulator is killed. It
-/// has no controlling terminal: what asks for a password there fails instead of waiting unseen.
+/// has no controlling terminal, so that a program that asks for a password fails instead of waiting
+/// unseen.
 ///
 /// A guard process stands between the two. It outlives a killed emulator for as long as it takes
 /// to end the command and what the command left in its group: SIGTERM, SIGKILL 2 s later, and
@@ -28,7 +29,7 @@ class ChildProcess {
     ChildProcess(Loop &loop, std::vector<std::string> words, int output = -1);
     ChildProcess(const ChildProcess &) = delete;
     ChildProcess &operator=(const ChildProcess &) = delete;
-    /// Has the command and what it started ended, without waiting for it.
+    /// Has the command and everything that it started ended, without waiting for that.
     ~ChildProcess();
 
     /// The command's own process.

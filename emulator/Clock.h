@@ -4,11 +4,11 @@
 
 namespace emulator {
 
-/// Never set back or forth: paces and limits must not depend on the date.
+/// A clock that is never set, because paces and limits must not depend on the date.
 using Clock = std::chrono::steady_clock;
 using TimePoint = Clock::time_point;
 
-/// A number of seconds as written by an operator, in the clock's own unit.
+/// Converts a number of seconds that an operator has written into the clock's unit.
 constexpr Clock::duration seconds(double count) {
     return std::chrono::duration_cast<Clock::duration>(std::chrono::duration<double>(count));
 }

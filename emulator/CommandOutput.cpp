@@ -33,7 +33,7 @@ std::string CommandOutput::lastWords() {
     takeLine();
     std::string words;
     for (const std::string &each : lines) {
-        if (timesSeen[each] <= 1) // 0: it came when no more lines were counted
+        if (timesSeen[each] <= 1) // 0 if it came when no more lines were counted
             words += each + "\n";
     }
     return words;

@@ -12,8 +12,8 @@ namespace emulator {
 
 /// What a command prints while its output cannot be shown: its last lines, for when it has ended.
 ///
-/// A program that runs for long complains of the same thing again and again. Such lines are left
-/// out, so that its last words can be found.
+/// A program that runs for a long time repeats the same complaint again and again. Such lines are
+/// left out, so that the last lines of interest can be found.
 class CommandOutput {
   public:
     explicit CommandOutput(Loop &itsLoop) : loop(itsLoop) {}

@@ -30,7 +30,7 @@ Display::Display() {
 
 bool Display::receive(unsigned char byte) {
     if (byte == commandPrefix) {
-        // A prefix behind a prefix: the command between them was lost.
+        // A prefix follows a prefix, so the command between them was lost.
         if (commandFollows)
             unknownCount++;
         commandFollows = true;
@@ -90,7 +90,7 @@ bool Display::execute(unsigned char command) {
     default:
         break;
     }
-    // Address 68 hex lies one past row 1's end. The counter takes it as it takes running past
+    // Address 68 hex is one past the end of row 1. The counter takes it as it takes running past
     // 67 hex, starting over at 00, so that a step to the left from it is row 1's last column.
     if (command >= row1Address && command <= row1Address + columns) {
         position = (columns + command - row1Address) % positions;

@@ -15,15 +15,14 @@ namespace emulator {
 namespace {
 
 constexpr int signalStatus = 128; // and the signal's number
-// The guard needs three at most to end the command, or to give up.
+// The guard needs at most three seconds to end the command or to give up.
 constexpr std::chrono::seconds commandPatience{4};
 constexpr std::chrono::seconds browserPatience{1};
-// A turn comes at least that often, and one that comes much later does because the emulator was
-// stopped.
+// There is a turn at least this often. If one comes much later, the emulator has been stopped.
 constexpr std::chrono::milliseconds idleTurn{500};
 constexpr std::chrono::milliseconds longestTurn{1000};
 
-// The address has a line of its own: it is there to be taken by other programs, too.
+// The address has a line of its own, so that other programs can read it.
 void announce(const WebServer &server) {
     std::cout << server.address() << std::endl;
     if (server.isOpenToOthers())
@@ -44,7 +43,7 @@ std::vector<std::string> withPath(std::vector<std::string> command, const std::s
     return command;
 }
 
-// Names the signals that end programs. Beyond them a status is rather the program's own.
+// Names the signals that end programs. A higher status is more likely the program's own.
 std::string described(int status) {
     std::string text = "status " + std::to_string(status);
     if (status > signalStatus && status <= signalStatus + SIGTERM)
@@ -74,7 +73,8 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
         front = std::make_unique<TerminalFront>(loop, display, keypad, use);
     if (options.isDrawn() || !isJourney)
         commandOutput = output.open();
-    // After all that may refuse: an older recording is not given up for nothing.
+    // Everything that may fail comes first, so that an older recording is not overwritten for
+    // nothing.
     if (options.record)
         startRecording(*options.record);
     // The recorder looks before anybody presses the next key.
@@ -202,7 +202,7 @@ void Emulator::finish(int exitStatus, const std::string &itsReason) {
     command->end();
 }
 
-// Gives the terminal back, too, before anything is said there.
+// This also gives the terminal back before anything is printed there.
 void Emulator::dismissOperators() {
     if (operators.empty())
         return;

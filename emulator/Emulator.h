@@ -24,7 +24,7 @@ namespace emulator {
 class Emulator {
   public:
     /// Opens the line and starts the command. The journey, if any, has been read by then.
-    /// Throws when the line, the terminal, the page's address, a file or a process cannot be had.
+    /// Throws if the line, the terminal, the page's address, a file or a process is not available.
     Emulator(const Options &options, std::optional<Journey> journey);
 
     /// Runs until the journey or the command ends, the operator quits or a signal comes, and then
@@ -55,13 +55,13 @@ class Emulator {
     std::unique_ptr<WebFront> webFront;
     std::ofstream recording;
     std::unique_ptr<Recorder> recorder;
-    std::vector<Operator *> operators; // those of the above that there are, until all is over
+    std::vector<Operator *> operators; // those of the above that exist, until all is over
     std::unique_ptr<ChildProcess> command;
     bool isJourney = false;
     TimePoint lastTurn;
     std::optional<int> result; // the exit status, once all is over
     std::string reason;        // for it, as the page tells it
-    TimePoint patience;        // until when the command's end is waited for then
+    TimePoint patience;        // until when the command's end is then waited for
     TimePoint farewell;        // until when browsers are told
     bool hasCommandEndedItself = false;
 };

@@ -6,7 +6,7 @@ namespace emulator {
 
 namespace {
 
-constexpr std::chrono::milliseconds tapTime{400}; // a slow finger's
+constexpr std::chrono::milliseconds tapTime{400}; // of a slow finger
 constexpr std::size_t mostWaiting = 4;
 
 } // namespace
@@ -41,7 +41,7 @@ void Finger::release(TimePoint now) {
     const bool isAnswered = keypad.answered() != down->answersBefore;
     const Down pressed = *down;
     lift();
-    // Down and up again before anybody could ask is a tap.
+    // A key that came up before the program could ask for it counts as a tap.
     if (!isAnswered && now - pressed.since < tapTime) {
         putDown(pressed.key, Manner::tap, pressed.since);
     }

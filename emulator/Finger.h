@@ -8,12 +8,12 @@
 
 namespace emulator {
 
-/// The finger of a person who cannot say for how long: a terminal tells of a key that was typed,
-/// not of one that goes down and comes up. One key is down at a time.
+/// The finger of a person at a terminal, which reports that a key was typed but not when it goes
+/// down and comes up. One key is down at a time.
 ///
 /// A typed key stays down as long as a finger would, and comes up when it has been answered once.
-/// If the program does not ask meanwhile, the key is forgotten, as on a real panel. Keys that are
-/// typed faster than the program can tell apart wait for their turn, if it asks at all.
+/// If the program does not ask in the meantime, the key is forgotten, as on a real panel. Keys that
+/// are typed faster than the program can tell them apart wait for their turn, if it asks at all.
 class Finger {
   public:
     explicit Finger(Keypad &itsKeypad) : keypad(itsKeypad) {}
@@ -25,9 +25,9 @@ class Finger {
     /// A key goes down until `release`.
     void press(Key key, TimePoint now);
     void release(TimePoint now);
-    /// Something was typed that is no key: it ends a hold.
+    /// Something was typed that is not a key of the panel, which ends a hold.
     void letGo();
-    /// Whatever is down comes up, asked for or not.
+    /// Whatever is down comes up, whether it has been answered or not.
     void lift();
 
     void look(TimePoint now);

@@ -4,7 +4,7 @@ namespace emulator {
 
 namespace {
 
-// Seven rows stand on the base line, the eighth is for what hangs below it.
+// Seven rows are above the base line, and the eighth is for what hangs below it.
 constexpr std::array<Glyph, '~' - ' ' + 1> glyphs{{
     {0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00}, // blank
     {0x04, 0x04, 0x04, 0x04, 0x04, 0x00, 0x04, 0x00}, // !

@@ -19,7 +19,7 @@ std::string_view trimmed(std::string_view text) {
     return text;
 }
 
-// A device that never ends must not fill the memory, so no more is read than a line may have.
+// No more is read than a line may have, so that a device that never ends does not fill the memory.
 bool readLine(std::istream &input, std::string &line) {
     line.resize(longestLine + 1);
     input.getline(line.data(), static_cast<std::streamsize>(line.size()));
@@ -32,7 +32,7 @@ bool readLine(std::istream &input, std::string &line) {
     return !input.fail();
 }
 
-// A step's text is printed again when it fails, and must not act on the terminal then.
+// The text of a step that fails is printed, and must not control the terminal.
 bool isText(std::string_view line) {
     return std::all_of(line.begin(), line.end(), [](char c) {
         return static_cast<unsigned char>(c) >= ' ' || blanks.find(c) != std::string_view::npos;
@@ -72,7 +72,7 @@ Journey::Journey(std::istream &input, std::string itsName, Stage stage) : name(s
 void Journey::add(Step step) {
     if (allSteps.size() == mostSteps)
         throw std::invalid_argument("there are too many steps");
-    // A tap's one poll could not be told from the hold's.
+    // The one poll of a tap could not be told from those of the hold.
     if (isScene(step.action))
         isKeyDown = false;
     if (isKeyDown && isAboutTheKeypad(step.action))

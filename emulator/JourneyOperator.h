@@ -14,7 +14,7 @@ class JourneyOperator : public Operator {
         : surroundings(loop),
           player(std::move(journey), panel, surroundings, output, limit, std::move(pictures)) {}
 
-    /// Tells which command the appliance is reached through, and its process.
+    /// Sets the command through which the appliance is reached, and its process.
     void setCommand(const std::string &program, int pid) { surroundings.setCommand(program, pid); }
 
     std::optional<int> look(TimePoint now) override {

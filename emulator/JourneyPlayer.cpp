@@ -100,7 +100,7 @@ bool JourneyPlayer::play(const step::Keys &sequence, bool begins) {
         return true;
     const Stroke &stroke = sequence.strokes[nextStroke];
     awaitAnswers();
-    // A single poll cannot wait for somebody to let go of the key.
+    // After a single poll the key has to come up at once.
     stroke.polls == 1 ? panel.keypad.tap(stroke.key) : panel.keypad.press(stroke.key);
     return false;
 }

@@ -13,7 +13,7 @@
 namespace emulator {
 
 /// Plays a journey on a display and a keypad, one step after the other. It has no clock of its own:
-/// time is what `advance` is told, in the real world as in a test.
+/// `advance` is told the time, both in the real world and in a test.
 class JourneyPlayer {
   public:
     struct Panel {
@@ -28,7 +28,7 @@ class JourneyPlayer {
                   Clock::duration limit,
                   std::optional<std::filesystem::path> pictures = std::nullopt);
 
-    /// Goes as far as the panel's state lets it; to be called whenever that has changed, whenever
+    /// Goes on as far as the panel's state allows. To be called whenever that has changed, whenever
     /// what the surroundings started has ended, and at `wakeAt`. Returns true when the journey is
     /// over. Throws std::runtime_error with the message for the operator when a step fails.
     bool advance(TimePoint time);
@@ -37,7 +37,7 @@ class JourneyPlayer {
     [[nodiscard]] std::size_t position() const { return next; }
     /// Goes on from the beginning of that step, with the limit that is in force there.
     void goTo(std::size_t step);
-    /// Time has passed in which nobody could act, as while the emulator was stopped.
+    /// Does not count a time in which nobody could act, because the emulator was stopped.
     void excuse(Clock::duration time) { deadline += time; }
 
   private:

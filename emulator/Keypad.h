@@ -25,9 +25,9 @@ class Keypad {
     /// Puts a key down for exactly one answer.
     void tap(Key key);
 
-    /// The program asked for a key. `sinceAnswerRead` tells whether it did so after it had read
-    /// the last answer: a request that it had given up by then may still be answered, and the
-    /// answer is read by its next poll, whose request was on the line already.
+    /// The program has asked for a key. `sinceAnswerRead` tells whether it did so after it had read
+    /// the last answer: a request that it has given up may still be answered, and that answer is
+    /// then read by the next poll, whose request was already on the line.
     void request(bool sinceAnswerRead);
 
     [[nodiscard]] std::optional<Key> down() const { return keyDown; }
@@ -46,7 +46,7 @@ class Keypad {
     [[nodiscard]] bool settled() const { return !keyDown && quietRequests >= wholePoll; }
 
   private:
-    // A poll without a key is known to be over when the request of the next one comes.
+    // That a poll without a key is over is known when the request of the next poll comes.
     static constexpr unsigned long wholePoll = 2;
 
     void answer();

@@ -20,8 +20,8 @@ constexpr int bitsPerByte = 11;
 
 constexpr std::size_t backlogBytes = 4096;
 
-// How often to look whether the program has read an answer. It asks again 0.1 s after that at the
-// earliest; a look that comes too late makes a tap one poll longer.
+// How often to check whether the program has read an answer. It asks again 0.1 s later at the
+// earliest; a check that comes too late makes a tap one poll longer.
 constexpr std::chrono::milliseconds answerLook{10};
 
 [[noreturn]] void fail(const std::string &what) {
@@ -46,7 +46,7 @@ Line::Line(bool fast, const std::optional<std::string> &tracePath)
     if (slave.get() < 0 || tcgetattr(slave.get(), &settings) != 0)
         fail("cannot open " + slavePath);
     cfmakeraw(&settings);
-    // Both ways, because stty reports a failure while it leaves the other way at another speed.
+    // Both directions are set, because stty fails if the other one is left at another speed.
     cfsetispeed(&settings, B2400);
     cfsetospeed(&settings, B2400);
     if (tcsetattr(slave.get(), TCSANOW, &settings) != 0)
@@ -81,7 +81,7 @@ void Line::collect() {
     if (answersRead != answersWritten && backlog.size() < backlogBytes) {
         pollfd unread{slave.get(), POLLIN, 0};
         const bool nothing = poll(&unread, 1, 0) == 0;
-        // A line that was hung up has forgotten what was unread, and this end has to be opened
+        // A line that has hung up has forgotten what was unread, and this end has to be opened
         // anew.
         const bool hungUp = (unread.revents & POLLHUP) != 0;
         if (hungUp)

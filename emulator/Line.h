@@ -15,10 +15,11 @@ namespace emulator {
 /// The serial line between the program and the panel: a pseudo-terminal of which the program
 /// opens the slave.
 ///
-/// A pseudo-terminal delivers at once what a UART takes 4.58 ms a byte for. So bytes are collected
-/// when they arrive and given to the panel when the real line would have carried them. What waits
-/// is bounded as in a UART's buffer; beyond that the line is not read, and the program's writes
-/// fail in the end (the pseudo-terminal itself takes some 20,000 bytes more).
+/// A pseudo-terminal delivers bytes at once, while a UART takes 4.58 ms for each. Bytes are
+/// therefore collected when they arrive, and given to the panel when the real line would have
+/// carried them. As in a UART's buffer, only so many can wait; beyond that the line is not read,
+/// and the program's writes fail in the end (the pseudo-terminal itself takes some 20,000 bytes
+/// more).
 class Line {
   public:
     struct Byte {
@@ -26,8 +27,9 @@ class Line {
         bool sinceAnswerRead; ///< sent after the program had read the last answer
     };
 
-    /// Opens the pseudo-terminal, raw and at 2400 baud both ways. With `fast` bytes are not paced.
-    /// With `tracePath` every arrival and answer is written to that file. Throws on failure.
+    /// Opens the pseudo-terminal, raw and at 2400 baud in both directions. With `fast`, bytes are
+    /// not delayed. With `tracePath` every arrival and answer is written to that file. Throws on
+    /// failure.
     explicit Line(bool fast, const std::optional<std::string> &tracePath = std::nullopt);
 
     /// The slave's path, for the program to open.

@@ -7,7 +7,7 @@
 
 namespace emulator {
 
-/// What the line carries to the panel, for those who watch it: the last bytes, and how many come.
+/// What the line carries to the panel: its last bytes, and how many there are in a second.
 class LineLoad {
   public:
     static constexpr std::size_t mostRecent = 12;
@@ -15,13 +15,13 @@ class LineLoad {
     explicit LineLoad(TimePoint now) : countedSince(now) {}
 
     void carried(unsigned char byte);
-    /// To be called now and then: the rate is that of the last second that has gone by.
+    /// To be called now and then. The rate is that of the last full second.
     void look(TimePoint now);
 
-    /// The last bytes in hexadecimal, the newest at the end, each with a blank behind it.
+    /// The last bytes in hexadecimal, the newest at the end, each followed by a blank.
     [[nodiscard]] std::string recentBytes() const;
     [[nodiscard]] double bytesPerSecond() const { return rate; }
-    /// Of what the line can carry.
+    /// The rate, relative to what the line can carry.
     [[nodiscard]] double percent() const;
 
   private:

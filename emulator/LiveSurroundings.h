@@ -13,8 +13,8 @@ class LiveSurroundings : public Surroundings {
   public:
     explicit LiveSurroundings(Loop &itsLoop) : loop(itsLoop) {}
 
-    /// The program's own command, of which `COMMAND --enter PID -- appliance VERB...` enters the
-    /// sandbox, and its process.
+    /// Sets the program's command and its process. `COMMAND --enter PID -- appliance VERB...`
+    /// enters the sandbox.
     void setCommand(const std::string &itsProgram, int itsPid) {
         program = itsProgram;
         pid = std::to_string(itsPid);

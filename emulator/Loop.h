@@ -14,8 +14,8 @@
 
 namespace emulator {
 
-/// The one place where the emulator waits: for descriptors, signals and a time. One thread; what
-/// happens is handled one after the other, and after each the emulator takes its turn.
+/// The one place where the emulator waits: for descriptors, signals and a time. There is one
+/// thread; events are handled one after the other, and after each the emulator takes its turn.
 class Loop {
   public:
     using Handler = std::function<void()>;
@@ -23,7 +23,7 @@ class Loop {
     /// `afterEvent` is called after everything that has happened, and when `wakeAt` has come.
     explicit Loop(Handler afterEvent);
 
-    /// Waits and handles until `stop`. What a handler throws comes out of here.
+    /// Waits for events and handles them until `stop`. Exceptions of a handler leave this function.
     void run() { context.run(); }
     void stop() { context.stop(); }
 

@@ -1,4 +1,4 @@
-// Numbers that people write, in options and in journeys.
+// Reads numbers that people write in options and in journeys.
 #pragma once
 
 #include <charconv>

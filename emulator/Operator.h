@@ -6,14 +6,14 @@
 
 namespace emulator {
 
-/// What those who sit at a front of the panel may do.
+/// What a person at the panel may do.
 enum class Use {
     operate, ///< they press the keys
     watch,   ///< somebody else does
 };
 
-/// Whoever works the panel or looks at it: a journey, a person at a terminal or in a
-/// browser, a recorder.
+/// Whoever uses the panel or looks at it: a journey, a person at a terminal or in a browser, or a
+/// recorder.
 ///
 /// Each has been handed the display and the keypad. The emulator asks it to look whenever the panel
 /// has taken in a byte and whenever anything else has happened.
@@ -32,7 +32,7 @@ class Operator {
 
     /// The line has carried this byte to the panel.
     virtual void carried(unsigned char /*byte*/) {}
-    /// The emulator was stopped for so long, and nobody could act.
+    /// Nobody could act for this time, because the emulator was stopped.
     virtual void excuse(Clock::duration /*stopped*/) {}
 };
 

@@ -44,7 +44,7 @@ std::string escaped(const std::string &text) {
     return result;
 }
 
-// Neighbouring dots share one stroke, which its dashes take apart again.
+// Neighbouring dots share one stroke, which its dashes separate again.
 std::string strokes(const Glyph &dots, int left, int top) {
     std::string path;
     for (int y = 0; y < glyphRows; y++) {

@@ -14,8 +14,8 @@ std::string withoutBlanksAtEnd(std::string text) {
     return text;
 }
 
-// What a journey says of the display; nothing where it cannot, such as
-// of a character outside ASCII.
+// The steps that expect what the display shows. There are none if a journey cannot express it, such
+// as a character outside ASCII.
 std::string stepsThatExpect(const Display &display) {
     const std::string row0 = display.visibleRow(0), row1 = display.visibleRow(1);
     if (!std::all_of(row0.begin(), row0.end(), isPrintable) ||
@@ -59,7 +59,8 @@ void Recorder::countAnswers() {
     if (!held || held->key != key) {
         if (held)
             writeStroke(false);
-        // While a key is down, the program goes on counting it: nothing can be waited for.
+        // While a key is down, the program goes on counting it, so a journey cannot wait for
+        // anything.
         if (!isKeyDown)
             output << sight;
     }
@@ -71,7 +72,7 @@ std::string Recorder::stroke(bool isReleased) const {
     if (!held)
         return "";
     const std::string name(traits(held->key).name);
-    // A tap's one poll could not be told from those of a key that is still down.
+    // The one poll of a tap could not be told from those of a key that is still down.
     if (held->polls == 1 && isReleased && !isKeyDown)
         return "tap " + name + "\n";
     return "hold " + name + " " + std::to_string(held->polls) + "\n" +
@@ -89,7 +90,7 @@ std::string Recorder::end() const {
 }
 
 void Recorder::finish() {
-    countAnswers(); // the last may have come after the last look
+    countAnswers(); // the last answer may have come after the last look
     output << end() << std::flush;
 }
 

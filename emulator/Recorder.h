@@ -10,23 +10,23 @@
 
 namespace emulator {
 
-/// Writes what is done at the panel as a journey: each key as the program has counted it, and in
-/// front of it what the panel showed when the key was pressed. The journey can be played at any
-/// time, since each step waits until the panel shows the same again. Each step is a line, and what
-/// has been written stays.
+/// Writes what is done at the panel as a journey: each key as the program has counted it, and
+/// before it what the panel showed when the key was pressed. The journey can be played at any time,
+/// because each step waits until the panel shows the same again. Each step is a line, and is not
+/// changed once it has been written.
 class Recorder : public Operator {
   public:
     /// Writes to `output` from now on.
     Recorder(std::ostream &output, const Display &display, const Keypad &keypad);
 
     std::optional<int> look(TimePoint now) override;
-    /// True when what has been written ends before a key and what the panel showed at it: what is
-    /// written from here on is a journey of its own.
+    /// True when what has been written ends before a key and before what the panel showed when it was
+    /// pressed. What is written from here on is a journey of its own.
     [[nodiscard]] bool isBetweenKeys() const { return !held && !isKeyDown; }
-    /// Writes the end, if it is to end now.
+    /// Writes the end of the journey.
     void finish();
-    /// The steps that would be the end if it were now: the key that is being counted, and what the
-    /// panel shows.
+    /// The steps that would end the journey now: the key that is being counted, and what the panel
+    /// shows.
     [[nodiscard]] std::string end() const;
 
   private:

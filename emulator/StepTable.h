@@ -1,5 +1,5 @@
-// The language of journeys, as a table: each kind of step has one row, which its syntax, its
-// explanation and its place in every list follow from.
+// The language of journeys, as a table: the row of a step determines its syntax, its
+// explanation, and its place in every list.
 #pragma once
 
 #include "emulator/Steps.h"

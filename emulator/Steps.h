@@ -1,5 +1,5 @@
-// What a journey is made of: one alternative for each kind of step, with just the fields that this
-// kind has. Their syntax is in StepTable, what they do is in JourneyPlayer.
+// The steps of a journey: one type for each kind of step, with the fields of that kind. StepTable
+// contains their syntax, and JourneyPlayer what they do.
 #pragma once
 
 #include "emulator/Clock.h"
@@ -78,41 +78,41 @@ struct Run {
     std::string command;
 };
 
-/// Something that happens at the appliance, or is looked up there: a verb and its arguments.
+/// A change or a check at the appliance: a verb and its arguments.
 struct Appliance {
     std::vector<std::string> words;
 };
 
-// The following ask for a program in virtual time.
+// The following steps need a program in virtual time.
 
 /// A fresh appliance, and a program that starts at the next step which is not about the appliance.
 struct Scene {
     std::string title;
 };
 
-/// From here on this command line prints this.
+/// From here on this command line of the program prints this.
 struct Prints {
     std::string command;
     std::string output;
 };
 
-/// The program reads these bytes in the place of the next poll's answer.
+/// The program reads these bytes in place of the panel's next answer.
 struct Answer {
     std::string bytes;
 };
 
-/// Just these bytes have been sent since the last step that pressed a key, key requests left out.
+/// Apart from key requests, just these bytes have been sent since the last step that pressed a key.
 struct ExpectSent {
     std::string bytes;
 };
 
-/// The next pause in which no key was read, and what it was made behind.
+/// The next pause in which no key was read, and what the panel showed in the meantime.
 struct ExpectPause {
     Clock::duration time;
     Sight sight;
 };
 
-/// The next run of the configuration script, and what it was made behind.
+/// The next run of the configuration script, and what the panel showed in the meantime.
 struct ExpectRun {
     std::string command;
     Sight sight;

@@ -8,7 +8,7 @@
 
 namespace emulator {
 
-/// What a journey reaches beside the panel: a shell, the appliance, and in a test the program.
+/// What a journey uses besides the panel: a shell, the appliance, and in a test the program.
 class Surroundings {
   public:
     Surroundings() = default;
@@ -16,9 +16,9 @@ class Surroundings {
     Surroundings &operator=(const Surroundings &) = delete;
     virtual ~Surroundings() = default;
 
-    /// Starts a command for the shell; throws when none can be started.
+    /// Starts a command in the shell, or throws if that fails.
     virtual void start(const step::Run &run) = 0;
-    /// Starts a change or a look-up at the appliance; throws when none can be started.
+    /// Starts a change or a check at the appliance, or throws if that fails.
     virtual void start(const step::Appliance &appliance) = 0;
     /// The exit status of what was begun last, 128 + signal if a signal ended it; nothing while
     /// it is still at work. Throws std::runtime_error with what is wrong in a test.

@@ -2,7 +2,7 @@
 
 #include "emulator/Font.h"
 
-// As functions only: the macros of the same names would replace words like `clear` and `move`.
+// Only the functions: the macros of the same names would replace words like `clear` and `move`.
 #define NCURSES_NOMACROS
 #include <curses.h>
 
@@ -24,7 +24,7 @@ namespace {
 
 constexpr std::chrono::milliseconds frameTime{100};
 constexpr std::chrono::milliseconds blinkTime{400};
-constexpr std::chrono::milliseconds leastLit{200}; // a tap may well be answered at once
+constexpr std::chrono::milliseconds leastLit{200}; // because a tap may be answered at once
 
 constexpr short glassColours = 1;
 
@@ -83,7 +83,7 @@ FileDescriptor openKeyboard() {
     return keyboard;
 }
 
-// Ctrl-S is a key like any other here: a terminal that is stopped would stop the panel.
+// Ctrl-S has no meaning here, because a stopped terminal would stop the panel.
 void ignoreFlowControl() {
     termios settings{};
     tcgetattr(STDIN_FILENO, &settings);
@@ -92,7 +92,7 @@ void ignoreFlowControl() {
     def_prog_mode();
 }
 
-// A terminal that nobody reads takes nothing more, and writing would wait for it.
+// A terminal that nobody reads takes nothing more, and writing to it would wait.
 bool isWritable() {
     pollfd terminal{STDOUT_FILENO, POLLOUT, 0};
     return poll(&terminal, 1, 0) == 1 && (terminal.revents & POLLOUT) != 0;
@@ -126,7 +126,7 @@ TerminalFront::TerminalFront(Loop &loop, const Display &itsDisplay, Keypad &itsK
 
 TerminalFront::~TerminalFront() {
     if (!isWritable())
-        tcflush(STDOUT_FILENO, TCOFLUSH); // what nobody reads would hold up the end
+        tcflush(STDOUT_FILENO, TCOFLUSH); // what nobody reads would delay the end
     if (use == Use::operate)
         send(mouseOff);
     endwin();
@@ -163,7 +163,7 @@ void TerminalFront::readInput() {
     const ssize_t count = read(keyboard.get(), bytes.data(), bytes.size());
     if (count < 0 && (errno == EINTR || errno == EAGAIN))
         return;
-    // A terminal that has gone away reads as its end, or fails.
+    // If the terminal has gone away, reading gives the end of file or fails.
     if (count <= 0) {
         input.pause(true);
         isGone = true;

@@ -17,24 +17,24 @@ namespace emulator {
 
 /// The panel on a terminal, as an operator sees it: display, keys, and what the line carries.
 ///
-/// One at a time, because the terminal has one screen. The terminal gets back what it had when
-/// this object is destroyed, and also when the program crashes.
+/// There is one at a time, because the terminal has one screen. The terminal is restored when this
+/// object is destroyed, and also if the program crashes.
 class TerminalFront : public Operator {
   public:
-    /// Takes over the terminal; throws std::runtime_error if the panel cannot be drawn on it. Of
-    /// one who watches, only q is taken.
+    /// Takes over the terminal; throws std::runtime_error if the panel cannot be drawn on it. From
+    /// a person who only watches, no key but q is accepted.
     TerminalFront(Loop &loop, const Display &display, Keypad &keypad, Use use);
     TerminalFront(const TerminalFront &) = delete;
     TerminalFront &operator=(const TerminalFront &) = delete;
     ~TerminalFront() override;
 
-    /// Ends with status 0 when the operator quits, and when the terminal of an operator goes away;
-    /// throws std::runtime_error when that of a watcher does.
+    /// Ends with status 0 when the operator quits or the operator's terminal goes away; throws
+    /// std::runtime_error when the terminal of a person who only watches does.
     std::optional<int> look(TimePoint now) override;
     [[nodiscard]] std::optional<TimePoint> wakeAt() const override;
     void carried(unsigned char byte) override { load.carried(byte); }
 
-    /// Draws for the terminal's size as it is now.
+    /// Draws for the terminal's present size.
     void resize();
     /// Gives the terminal back while the emulator is stopped, and takes it over again.
     void stopWith(const std::function<void()> &stop);
@@ -54,8 +54,8 @@ class TerminalFront : public Operator {
     void drawLine(TimePoint now);
 
     TerminalRescue rescue;
-    // Not standard input itself: the loop reads without blocking, and the shell shares that
-    // setting.
+    // Not standard input itself, because the loop reads without blocking, and the shell would share
+    // that setting.
     FileDescriptor keyboard;
     const Display &display;
     Keypad &keypad;

@@ -10,12 +10,12 @@ namespace emulator {
 namespace {
 
 constexpr char escapeByte = '\033';
-// How long an ESC may be a sequence's start, and how long a sequence may take to go on.
+// How long an ESC may be the start of a sequence, and how long a sequence may pause.
 constexpr std::chrono::milliseconds loneEscape{25};
 constexpr std::chrono::milliseconds brokenSequence{200};
 constexpr std::size_t longestSequence = 32;
 
-// The sequences of keys behind ESC, of the kinds of terminal that are in use.
+// The sequences that terminals in use send after ESC for these keys.
 struct KeySequence {
     std::string_view text;
     TerminalKeys::Event event;

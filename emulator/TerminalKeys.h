@@ -11,8 +11,8 @@
 
 namespace emulator {
 
-/// What a terminal sends, made out of its bytes: keys, and the mouse. A sequence that is not known
-/// means nothing; one that does not go on is forgotten, so that nothing waits for its end.
+/// Reads keys and the mouse from the bytes that a terminal sends. A sequence that is not known
+/// means nothing, and one that is not continued is forgotten, so that nothing waits for its end.
 class TerminalKeys {
   public:
     struct Tap {
@@ -40,7 +40,7 @@ class TerminalKeys {
     void takeCharacter(char byte, std::vector<Event> &events);
     void finishSequence(std::vector<Event> &events);
 
-    std::string sequence; // what has come of one, beginning with ESC
+    std::string sequence; // the part that has come, beginning with ESC
     TimePoint lastByte;
 };
 

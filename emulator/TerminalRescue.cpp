@@ -14,8 +14,8 @@ namespace emulator {
 
 namespace {
 
-// All that the handler needs stands ready, because it may not allocate. Nor may it take a
-// sequence from ncurses, whose own state may be what broke.
+// Everything that the handler needs is prepared, because it must not allocate. Nor may it take a
+// sequence from ncurses, whose own state may be broken.
 struct State {
     termios settings;
     std::array<char, 256> sequences;
@@ -47,13 +47,13 @@ void prepare() {
 
 void restore(int signal) {
     tcsetattr(STDIN_FILENO, TCSANOW, &state.settings);
-    // A failure cannot be helped any more.
+    // Nothing can be done about a failure.
     [[maybe_unused]] const ssize_t written =
         write(STDOUT_FILENO, state.sequences.data(), state.length);
     for (std::size_t i = 0; i < crashes.size(); i++)
         if (crashes.at(i) == signal)
             sigaction(signal, &formerActions.at(i), nullptr);
-    raise(signal); // comes when this handler has returned, and ends the program as it should
+    raise(signal); // takes effect when this handler has returned, and ends the program as it should
 }
 
 } // namespace

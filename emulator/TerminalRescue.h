@@ -2,8 +2,8 @@
 
 namespace emulator {
 
-/// Gives the terminal back what it had if the program crashes while this object lives. To be
-/// created before anything changes the terminal; one at a time.
+/// Restores the terminal if the program crashes while this object exists. It has to be created
+/// before anything changes the terminal, and there can be only one at a time.
 class TerminalRescue {
   public:
     /// Throws std::runtime_error if the kind of terminal is not known.

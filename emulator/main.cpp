@@ -17,7 +17,7 @@ int complain(int status, const std::string &message) {
     for (const char c : message)
         std::cerr << (static_cast<unsigned char>(c) < ' ' && c != '\n' ? '?' : c);
     if (message.back() != '\n')
-        std::cerr << '\n'; // a picture at its end brings its own
+        std::cerr << '\n'; // a picture at the end of a message has its own
     return status;
 }
 
