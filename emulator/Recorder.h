@@ -20,8 +20,8 @@ class Recorder : public Operator {
     Recorder(std::ostream &output, const Display &display, const Keypad &keypad);
 
     std::optional<int> look(TimePoint now) override;
-    /// True when what has been written ends before a key and before what the panel showed when it was
-    /// pressed. What is written from here on is a journey of its own.
+    /// True when what has been written ends before a key and before what the panel showed when it
+    /// was pressed. What is written from here on is a journey of its own.
     [[nodiscard]] bool isBetweenKeys() const { return !held && !isKeyDown; }
     /// Writes the end of the journey.
     void finish();
