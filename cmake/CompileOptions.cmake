@@ -14,7 +14,7 @@ if(KESTROVA_SANITIZE)
         -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
     target_link_options(kestrova-options INTERFACE -fsanitize=address,undefined)
 else()
-    # Which of them there are depends on the processor: the fourth is arm64's kind of the third.
+    # The processor decides which of them exist: the fourth is what arm64 has instead of the third.
     foreach(flag -fstack-protector-strong -fstack-clash-protection -fcf-protection
             -mbranch-protection=standard)
         string(MAKE_C_IDENTIFIER KESTROVA_HAS${flag} accepted)

@@ -13,7 +13,8 @@ using namespace std::chrono_literals;
 
 namespace {
 
-// What stands between `before` and `after` in a command line made of just these three.
+// Returns the part of a command line between `before` and `after`, of which it must consist
+// otherwise.
 std::optional<std::string> between(const std::string &command, const std::string &before,
                                    const std::string &after) {
     const std::size_t fixed = before.length() + after.length();
@@ -36,7 +37,7 @@ Appliance::Words linesOf(const std::string &text) {
     return lines;
 }
 
-// The fact that a verb is about, and what it says of it.
+// The fact that a verb changes or checks, and the value that the verb gives.
 std::pair<std::string, std::string> factAndValue(const Appliance::Words &words) {
     const std::set<std::string> oneOfMany = {"port", "file", "server", "prints"};
     std::string name = words[0], value;
@@ -48,7 +49,7 @@ std::pair<std::string, std::string> factAndValue(const Appliance::Words &words) 
     return {name, value};
 }
 
-// The text without some of its lines, which are asked about in order.
+// Returns the text without some of its lines, which are asked about in order.
 std::string without(const std::string &text,
                     const std::function<bool(const std::string &)> &isDropped) {
     std::string rest;
@@ -196,7 +197,7 @@ int Appliance::runScript(const Words &arguments) {
     return EXIT_SUCCESS;
 }
 
-// It leaves the checks of the values to the script proper.
+// The real script checks the values; this one does not.
 int Appliance::configurePort(const Words &arguments) {
     const std::string &port = arguments.at(2);
     std::map<std::string, Words> given;

@@ -1,7 +1,7 @@
-// The appliance as the tests have it: what is known about it in plain text, what the program's
-// commands print about it, and what its configuration script does. It knows the verbs that the box
-// knows, and two more: `server PORT ADDRESS/PREFIX`, a DHCP server at the port's far end, and
-// `prints COMMAND OUTPUT`, what this command line prints whatever the rest.
+// The appliance of the tests: plain text that describes it, what the program's commands print about
+// it, and what its configuration script does. It has the verbs of the box and two more: `server
+// PORT ADDRESS/PREFIX` puts a DHCP server at the port's far end, and `prints COMMAND OUTPUT` fixes
+// what this command line prints.
 #pragma once
 
 #include <boost/algorithm/string/predicate.hpp>
@@ -23,14 +23,15 @@ class Appliance {
     /// The appliance that the box starts with.
     static Appliance delivered();
 
-    /// Does what an `appliance` step says; throws std::runtime_error when a look-up finds something
-    /// else. Not for the verbs that are about the program.
+    /// Does what an `appliance` step says; throws std::runtime_error if a check fails. The verbs
+    /// that are about the program are handled elsewhere.
     void act(const Words &words);
 
-    /// What `act` has last made of this: "hostname", say, "port eth0" or "file /etc/hostname".
+    /// The value that `act` has last given to, for example, "hostname", "port eth0" or
+    /// "file /etc/hostname".
     std::optional<std::string> fact(const std::string &name) const;
 
-    /// What a command line of the program prints. One that no appliance knows is a test's failure.
+    /// What a command line of the program prints. An unknown command line makes the test fail.
     std::string output(const std::string &command) const;
 
     /// How long the configuration script takes, and, when that time is over, what it does with
@@ -48,6 +49,6 @@ class Appliance {
 
 inline const std::string applyScript = "/opt/kestrova/scripts/ezio/apply.py ";
 
-/// The configuration script's arguments in this command line; none where it is another command.
+/// The configuration script's arguments in this command line, or none if it runs another command.
 Appliance::Words scriptArguments(const std::string &command);
 std::string contents(const std::filesystem::path &path);

@@ -1,5 +1,5 @@
-// Plays every journey in virtual time: those that are also played live and photographed, those that
-// only tests can play, and, to look into a fault, one given by hand as PANEL_JOURNEY=FILE.
+// Plays every journey in virtual time: those that are also played live, those that only tests can
+// play and, to examine a fault, one that is given as PANEL_JOURNEY=FILE.
 #include "Rack.h"
 
 #include <filesystem>

@@ -1,4 +1,4 @@
-// What most tests need to meet the program: a fresh process, and an operator who goes turn by turn.
+// What most tests need: a fresh process for the program, and an operator who acts turn by turn.
 #pragma once
 
 #include "World.h"
@@ -10,11 +10,11 @@
 
 #include <functional>
 
-/// Runs a check in a process of its own, so that it meets a program that has just been started.
-/// Returns whether it held; a failure is printed there.
+/// Runs a check in a process of its own, with a program that has just been started. Returns whether
+/// it succeeded; a failure is printed there.
 [[nodiscard]] bool holdsInFreshProgram(const std::function<void()> &check);
 
-/// Defines a test that meets a program which has just been started; its body follows.
+/// Defines a test of a program that has just been started; its body follows.
 #define FRESH_TEST(suite, name)                                                                    \
     static void check##suite##name();                                                              \
     TEST(suite, name) {                                                                            \
@@ -41,7 +41,7 @@ class Operator {
         world().unread += bytes;
         loop->turn();
     }
-    /// Holds the key and lets it go in no time, as a garbled answer does.
+    /// Holds the key, and releases it without letting time pass, as a garbled answer does.
     void hold(emulator::Key key, int polls) {
         for (int k = 0; k < polls; ++k)
             poll(key);

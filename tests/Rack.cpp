@@ -19,7 +19,7 @@ namespace {
 
 constexpr std::chrono::seconds usualLimit{10};
 constexpr Micros commandTime = 5ms;
-// The longest pause is 3 s; around it a poll, the turn's own pause, and the commands of a page.
+// The longest pause is 3 s; a poll, the turn's own pause, and the commands of a page come on top.
 constexpr Micros longestTurn = 3'700ms;
 constexpr std::size_t hiddenByAWipe = 24; // blanks past the visible columns
 
@@ -33,7 +33,7 @@ bool isApplyScreen() {
            boost::starts_with(world().display.visibleRow(1), "> Apply Changes");
 }
 
-/// What passes from one start of the program to the next.
+/// What one start of the program hands over to the next.
 struct Passage {
     std::size_t position = 0; // in the journey
     Micros::rep now = world().now.count();
@@ -140,7 +140,7 @@ class Rack : public Surroundings {
     }
 
   private:
-    // What stands before the program's start: the appliance's state.
+    // The state of the appliance before the program starts.
     void setUp() {
         const auto &steps = journey.steps();
         for (; passage.position < steps.size(); passage.position++) {
@@ -160,7 +160,7 @@ class Rack : public Surroundings {
         }
     }
 
-    // The program has drawn what it had to, and asks for the next key.
+    // The program has finished drawing and asks for the next key.
     void noteRequest() {
         World &w = world();
         requestsSeen = w.keypad.requests();
@@ -195,7 +195,7 @@ class Rack : public Surroundings {
         }
     }
 
-    // A scene says all that the program has done meanwhile.
+    // A scene has to expect everything that the program has done in the meantime.
     void endScene() {
         const World &w = world();
         if (!passage.isInScene)
@@ -218,7 +218,8 @@ class Rack : public Surroundings {
         world().appliance.act({"prints", prints.command, prints.output});
     }
 
-    // Over when the program asks for the next key, and so has drawn what it made of this one.
+    // The turn is over when the program asks for the next key, because it has then drawn its
+    // reaction.
     void begin(const step::Answer &answer) {
         world().unread += answer.bytes;
         isDone = [reads = world().reads, requests = 0UL]() mutable {
@@ -261,7 +262,7 @@ class Rack : public Surroundings {
 
     const Journey &journey;
     Passage &passage;
-    std::ostringstream said; // pictures and words, for nobody
+    std::ostringstream said; // pictures and words, which nobody reads
     JourneyPlayer player;
     std::function<bool()> isDone = [] { return true; }; // the test's step that was begun
     Appliance::Words hostnameScript;                    // at work in the background, until then:

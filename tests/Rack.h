@@ -1,6 +1,6 @@
-// A journey's surroundings in virtual time: the rack that the panel and the appliance are built
-// into, with the program running there. Plays journeys, and watches that some things hold on every
-// screen whatever an operator does.
+// The surroundings of a journey in virtual time: the rack that contains the panel and the appliance
+// with the running program. It plays journeys, and checks what has to hold on every screen whatever
+// an operator does.
 #pragma once
 
 #include "Operator.h"
@@ -16,10 +16,10 @@ struct Outcome {
     long long turns;
 };
 
-/// Plays a journey in virtual time, in a process of its own for the program's each start. What
-/// fails is printed, unless `silently`. Pictures are written to `pictures` if that names a folder.
+/// Plays a journey in virtual time, in a new process for each start of the program. What fails is
+/// printed, unless `silently`. Pictures are written to `pictures` if that names a folder.
 Outcome play(const emulator::Journey &journey, bool silently = false,
              const std::string &pictures = "");
 
-/// The journey that this text is; throws std::invalid_argument when it is none.
+/// Reads a journey from this text; throws std::invalid_argument if it is none.
 emulator::Journey readJourney(const std::string &text, const std::string &name);

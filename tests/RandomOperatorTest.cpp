@@ -1,6 +1,7 @@
-// An operator who knows nothing of any screen, at appliances in any state: whatever he does, some
-// things hold on every screen (see Rack). He writes journeys; one that fails is printed, cut to its
-// shortest, to be played again with PANEL_JOURNEY=FILE, or watched on the drawn panel.
+// An operator who knows nothing about the screens, at appliances in any state: whatever this
+// operator does, some things have to hold on every screen (see Rack). The operator writes journeys.
+// One that fails is shortened and printed; it can be played again with PANEL_JOURNEY=FILE, or on
+// the emulated panel.
 #include "Rack.h"
 
 #include <iostream>
@@ -55,7 +56,7 @@ Lines appliance(Dice &dice) {
     return lines;
 }
 
-// What he does next; a key that he leaves down is let go before the next one is tapped.
+// What the operator does next; a key that is still down is released before the next one is tapped.
 void act(Dice &dice, Lines &journey, bool &isKeyDown) {
     static const Lines names = {"up", "down", "down", "enter", "enter", "enter", "escape"};
     static const Lines polls = {"1", "1", "1", "2", "5", "6", "7", "30"};
@@ -102,10 +103,10 @@ std::string textOf(const Lines &lines) {
 Outcome playLines(const Lines &lines) try {
     return play(readJourney(textOf(lines), "random"), true);
 } catch (const std::invalid_argument &) {
-    return {true, 0}; // what is left is no journey: a key is still held, say
+    return {true, 0}; // what is left is not a journey, because, for example, a key is still held
 }
 
-// Leaves out whatever can be left out with the fault still showing, in ever smaller pieces.
+// Leaves out everything, in ever smaller pieces, without which the fault still shows.
 Lines shortest(Lines journey) {
     for (std::size_t piece = journey.size() / 2; piece > 0; piece /= 2) {
         for (std::size_t at = 0; at < journey.size();) {

@@ -1,7 +1,7 @@
-// The world that the program lives in, as the tests have it: an appliance of plain text, the
-// emulated panel at the far end of the serial line, and a clock that moves only when the program
-// waits or has a command run. It stands in for the POSIX calls that the program makes, and owns
-// every path of the program: a file that it does not have is missing, never the machine's own.
+// The world in which the tests run the program: an appliance of plain text, the emulated panel at
+// the far end of the serial line, and a clock that moves only when the program waits or runs a
+// command. The world replaces the POSIX calls of the program and has all its files: one that the
+// world does not have is missing, even if the machine has it.
 #pragma once
 
 #include "Appliance.h"
@@ -32,8 +32,8 @@ struct World {
     unsigned long reads = 0; // of answers
     std::string lastRead;    // may be several answers, of which the first counts
 
-    /// Somebody looks at the panel whenever it has taken in a byte or time has passed, and when he
-    /// wants to.
+    /// Looks at the panel whenever it has taken in a byte, when time has passed, and at the time
+    /// that the observer asks for.
     std::function<void()> look = [] {};
     std::function<Micros()> wakeAt = [] { return Micros::max(); };
     Micros now{1'700'000'000'000'000};
@@ -43,7 +43,7 @@ struct World {
     // What the program has done.
     struct Deed {
         std::string what;   // a command, or how long a pause: "3000 ms"
-        std::string behind; // what the panel showed meanwhile
+        std::string behind; // what the panel showed in the meantime
     };
     std::string sent;                // bytes written,
     std::vector<std::size_t> writes; // the length of each write,
@@ -54,13 +54,13 @@ struct World {
     std::vector<Deed> runs;          // of the configuration script
     std::vector<std::string> events; // "clock", "run COMMAND", "start COMMAND", "open PATH", "row"
 
-    /// Both rows as "row 0|row 1", and without the blanks at their ends.
+    /// Both rows as "row 0|row 1", without the blanks at their ends.
     std::string rows() const { return display.visibleRow(0) + "|" + display.visibleRow(1); }
     std::string shown() const {
         return boost::trim_right_copy(display.visibleRow(0)) + "|" +
                boost::trim_right_copy(display.visibleRow(1));
     }
-    /// Lets this time pass, or, if `forAnswer`, as much of it as goes by before there is one.
+    /// Lets this time pass or, if `forAnswer`, less of it if an answer comes earlier.
     void pass(Micros time, bool forAnswer = false);
 };
 

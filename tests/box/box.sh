@@ -1,7 +1,7 @@
-# What the box promises to who starts it, as this user and, for root, as an ordinary user too.
+# Tests what the box promises, as this user and, if that is root, as an ordinary user, too.
 . "$(dirname "$0")/expect.sh"
 unset PANEL_TTY
-# The box is copied to where everyone may go: an ordinary user may not be able to reach the checkout.
+# The box is copied to where everyone may go, because the checkout may be out of reach for this user.
 copy=$(mktemp -d /tmp/box.XXXXXX) || exit 1
 trap 'rm -rf "$copy"' EXIT
 trap 'exit 1' HUP INT TERM
@@ -13,7 +13,7 @@ cd "$copy" || exit 1
 
 box() { $user "$copy/box/kestrova-panel-box" "$@"; }
 host_state() { hostname; ip -o link | cut -d: -f2; cat /etc/hostname /etc/resolv.conf; }
-# A folder that this user may enter and the box's root may not, where there is such a folder.
+# A folder that this user may enter and the box's root may not, if there can be such a folder.
 make_private() {
     rm -rf private
     mkdir private
@@ -53,7 +53,7 @@ for user in "" "setpriv --reuid=65534 --regid=65534 --clear-groups"; do
 1    box --no-tty --script-fails -- /opt/kestrova/scripts/ezio/apply.py hostname --hostname a
 TEXT
 
-    # What is wrong with the appliance is said before a box is made of it.
+    # A fault in the appliance's files is reported before the box is made.
     while read -r file content; do
         cp -R "$copy"/box/appliance/. broken
         printf "$content" >"broken/$file"
@@ -85,7 +85,7 @@ TEXT
     expect "a pipe among the files" "125 1" "$? $(wc -l <said)"
     rm broken/etc/fifo
 
-    # The limits are those of the namespace around, not the host's.
+    # The limits are those of the surrounding namespace, not those of the host.
     for kind in user pid mnt net uts ipc; do
         $user unshare --user --map-root-user sh -c "echo 0 >/proc/sys/user/max_${kind}_namespaces
             exec box/kestrova-panel-box --no-tty -- true" 2>said
@@ -98,14 +98,14 @@ TEXT
     expect "port without address" "" "$(box --no-tty -- ifconfig eth2 | grep inet)"
     expect "first process" bwrap "$(box --no-tty -- ps -o comm= 1)"
 
-    # The second run of the command sees the new name, and its end is the box's end.
+    # The second run of the command sees the new name, and when it ends, the box ends.
     expect "runs" "rack12-monitor-west new 42 " "$({ box --no-tty -- sh -c '
         hostname
         [ $(hostname) != new ] || exit 42
         /opt/kestrova/scripts/ezio/apply.py hostname --hostname new &
         sleep 60'; echo $?; } | tr '\n' ' ')"
 
-    # The pipe ends when the last process that holds it is gone.
+    # The pipe ends when the last process that holds it has ended.
     $user "$copy/box/kestrova-panel-box" --no-tty -- sleep 1000 >fifo &
     outer=$!
     exec 3<fifo

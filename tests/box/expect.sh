@@ -1,4 +1,4 @@
-# expect TITLE WANTED GOT: says what differs and makes the script's `exit $failed` tell.
+# expect TITLE WANTED GOT: prints a difference, and makes the script's `exit $failed` fail.
 failed=0
 expect() {
     [ "$2" = "$3" ] || { failed=1; printf 'FAILED %s\n  wanted: %s\n  got:    %s\n' "$@"; }

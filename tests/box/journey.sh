@@ -1,5 +1,5 @@
-# Plays a journey with the real program in the box. The pictures that it takes have to be those of
-# the documentation, byte for byte: EMULATOR PROGRAM JOURNEY.
+# EMULATOR PROGRAM JOURNEY: plays a journey with the real program in the box. The pictures that it takes
+# have to be those of the documentation, byte for byte.
 cd "$(dirname "$(realpath "$0")")/../.." || exit 1
 taken=$(mktemp -d) || exit 1
 trap 'rm -r "$taken"' EXIT

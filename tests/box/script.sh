@@ -1,14 +1,14 @@
-# What the stand-in configuration script does to the appliance it runs on.
+# Tests what the stand-in for the configuration script does to the appliance.
 if [ ! -e /run/box/ready ]; then
     here=$(dirname "$(realpath "$0")")
-    # As a text: the box's root may not be able to reach this folder.
+    # The script is passed as text, because the box's root may be unable to reach this folder.
     exec "$here/../../box/kestrova-panel-box" --no-tty -- \
         sh -c "$(cat "$here/expect.sh" "$here/script.sh")"
 fi
 delivered=/run/box/appliance/etc
 script=/opt/kestrova/scripts/ezio/apply.py
 
-# What the program would read: the script's output and then its status.
+# Prints what the program would read: the script's output and then its status.
 apply() { $script "$@" 2>/dev/null; echo $?; }
 address() { ip -4 -o addr show dev "$1" | awk '{ print $4 }'; }
 
@@ -46,7 +46,7 @@ expect "servers" "search example.net nameserver 9.9.9.9 nameserver 1.1.1.1" \
 expect "kernel" "192.0.2.77/24 default via 192.0.2.254 dev eth0" \
     "$(address eth0) $(ip route show default | xargs)"
 
-# Stanzas that run on would be read as one by the program: an empty line comes between them.
+# The program would read stanzas without an empty line between them as one.
 printf 'iface eth1 inet static\n address 10.0.0.1\niface eth2 inet dhcp\n' >/etc/network/interfaces
 expect "DHCP twice" "0 0" "$(apply iface --name eth1 --dhcp) $(apply iface --name eth1 --dhcp)"
 expect "stanzas" "iface eth1 inet dhcp  iface eth2 inet dhcp " \

@@ -105,7 +105,7 @@ template <typename Action> std::string refusal(Action action) try {
     return error.what();
 }
 
-// Each line of the file is a step that is not to be had, here while a key is held.
+// Each line of the file is a step that is refused, some of them only because a key is held.
 TEST(Journey, RefusesWrongStepsWithTheirLine) {
     std::vector<std::string> steps{"\x1B[2J", "say \x01"};
     std::ifstream file(REFUSED_STEPS);

@@ -1,4 +1,4 @@
-// A person at a terminal: what its bytes mean, and what a finger that types does to the keypad.
+// A person at a terminal: what the bytes of the terminal mean, and what typing does to the keypad.
 #include "emulator/Finger.h"
 #include "emulator/TerminalKeys.h"
 

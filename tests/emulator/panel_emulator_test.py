@@ -1,8 +1,8 @@
 #!/usr/bin/python3
 """Runs the real panel-emulator (the first argument) on small commands, without a terminal and on one.
 
-What it does with the panel's bytes, keys and steps is tested in process; this is about the program:
-its files and streams, its terminal, and the command that it starts.
+Other tests cover what it does with the panel's bytes, keys and steps. This one covers the program: its
+files and streams, its terminal, and the command that it starts.
 """
 
 import fcntl
@@ -33,7 +33,7 @@ done
 
 
 def play(journey, *options, command=KEYS, **streams):
-    """The finished process of the emulator that has played this journey."""
+    """Returns the finished process of the emulator that has played this journey."""
     return subprocess.run([EMULATOR, "--journey", "-", *options, "--", "sh", "-c", command],
                           input=journey, capture_output=not streams, text=True, timeout=30,
                           check=False, **streams)
@@ -45,7 +45,7 @@ def descendants(pid):
 
 
 class Terminal:
-    """The emulator on a terminal of its own; without a hang-up signal, if need be."""
+    """The emulator on a terminal of its own, which sends no hang-up signal if it is not controlling."""
 
     def __init__(self, *arguments, kind="xterm", is_controlling=True, command=KEYS):
         self.end, other_end = pty.openpty()
@@ -75,11 +75,11 @@ class Terminal:
         os.write(self.end, keys)
 
     def status(self):
-        """The emulator's, once it has ended; what it says until then is kept."""
+        """Returns the status of the emulator once it has ended, and keeps what it prints until then."""
         give_up = time.monotonic() + 10
         has_ended = False
         while not has_ended and time.monotonic() < give_up:
-            has_ended = self.process.poll() is not None  # and what it has said is there to be read
+            has_ended = self.process.poll() is not None  # so that everything it has printed can be read
             try:
                 while select.select([self.end], [], [], 0.05)[0]:
                     self.shown += os.read(self.end, 4096)
@@ -140,7 +140,7 @@ class WithoutTerminal(unittest.TestCase):
     def test_output_that_cannot_be_written_is_a_failure(self):
         with open("/dev/full", "w", encoding="ascii") as full:
             self.assertEqual(play("say x", stdout=full, stderr=subprocess.DEVNULL).returncode, 1)
-        # Closed, its number must not become the line's.
+        # If standard output is closed, its number must not become that of the pseudo-terminal.
         closed = play("say x\nexpect ready", stdout=None, stderr=subprocess.DEVNULL,
                       preexec_fn=lambda: os.close(1))
         self.assertEqual(closed.returncode, 1)

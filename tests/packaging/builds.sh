@@ -1,4 +1,4 @@
-# The builds that an integrator may want, from sources $1, and what each installs into a folder.
+# Tests the builds that an integrator may want, from sources $1, and what each of them installs.
 . "$(dirname "$0")/../box/expect.sh"
 . "$(dirname "$0")/read-only.sh"
 work=$(mktemp -d) || exit 1
@@ -22,7 +22,7 @@ installed() {
     (cd "$folder/prefix" && ls -d bin/* sbin/* 2>/dev/null | xargs)
 }
 source=$1
-without_tests=-DCMAKE_DISABLE_FIND_PACKAGE_GTest=ON # as where GoogleTest is not installed
+without_tests=-DCMAKE_DISABLE_FIND_PACKAGE_GTest=ON # as if GoogleTest were not installed
 
 try program -DKESTROVA_TOOLS=OFF $without_tests
 expect "program alone" sbin/kestrova-panel "$(installed)"

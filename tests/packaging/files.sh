@@ -1,4 +1,4 @@
-# What an installation from build folder $1, for prefix $2, holds, and that it works where it lies.
+# Tests what an installation from build folder $1 for prefix $2 contains, and that it works in place.
 . "$(dirname "$0")/../box/expect.sh"
 . "$(dirname "$0")/read-only.sh"
 work=$(mktemp -d) || exit 1

@@ -1,4 +1,4 @@
-# read_only FOLDER... -- COMMAND: with nothing of the host writable but these folders.
+# read_only FOLDER... -- COMMAND: runs COMMAND with only these folders of the host writable.
 read_only() {
     writable=
     for place; do

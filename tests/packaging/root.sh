@@ -1,8 +1,8 @@
 #!/bin/sh
 # Installs, runs, upgrades, removes and purges the packages of folder $1 in a throw-away Debian with a
 # service manager of its own, where those of folder $2 were installed first. What is not real there:
-# the line is a pseudo-terminal, and its record among the devices is written by hand, in the place of
-# a terminal that the kernel has.
+# the line is a pseudo-terminal, and its record among the devices is written by hand, as if it were a
+# terminal of the kernel.
 here=$(dirname "$(realpath "$0")")
 . "$here/../box/expect.sh"
 . "$here/throw-away.sh"
@@ -33,8 +33,8 @@ dpkg-deb -R "$1"/kestrova-panel_*.deb "$work/upgrade"
 sed -i '/^Version:/s/$/.1/' "$work/upgrade/DEBIAN/control"
 must dpkg-deb -b "$work/upgrade" "$root/root/upgrade.deb"
 
-# The two scripts there are, as delivered, and with a gate where they have taken the port down or are
-# about to change the name.
+# The two scripts, as delivered, and with a gate at the point where they have taken the port down or
+# are about to change the name.
 sed -n '/^#!/,/^```/{/^```/!p}' "$here/../../docs/integration.md" >"$root/root/example"
 cp "$here/../../box/appliance/opt/kestrova/scripts/ezio/apply.py" "$root/root/stand-in"
 gate=/opt/kestrova/gate
@@ -47,7 +47,7 @@ sed "s|run(\"ifconfig\"|run(\"$gate/gate\", \"wait\"); &|; s|run(\"hostname\"|ru
 printf '#!/bin/sh\nexec %s/gate run "$@"\n' $gate >"$root$gate/apply.py"
 chmod +x "$root/root/example" "$root/root/stand-in" "$root$gate"/*
 
-# Every end that the program can come to, twice: each script sets a port once and the name once.
+# The program ends in every possible way, twice, so that each script sets a port and the name once.
 interruptions() {
     while IFS='|' read -r title end back; do
         for scripts in example:stand-in stand-in:example; do
@@ -70,14 +70,14 @@ TEXT
     cat "$here/again.journey" "$here/reboot.journey"
 } >"$root/root/all.journey"
 
-# Where no service manager runs, as in an image's build.
+# No service manager runs, as when an image is built.
 must $container sh -c "$apt install /root/kestrova-panel_*.deb && dpkg --purge kestrova-panel"
 expect "left after an installation without a service manager" "" "$(leftovers)"
 must $container sh -c "$apt install /root/before/*.deb && $apt install /root/kestrova-panel-tools_*.deb"
 expect "enabled" kestrova-panel.service "$(ls "$root/etc/systemd/system/dev-ttyS1.device.wants")"
 
 cp -R "$root"/usr/share/kestrova-panel/box/appliance/[eo]* "$root"
-ln -s /dev/null "$root/etc/systemd/system/networking.service" # would not find its ports at boot
+ln -s /dev/null "$root/etc/systemd/system/networking.service" # it would not find its ports at boot
 boot
 must inside sh -ec '
     mkdir -p /run/udev/data /run/udev/tags/systemd
@@ -97,7 +97,7 @@ must inside sh -ec '
         -- sleep infinity >/root/played 2>&1; systemctl poweroff"'
 must timeout 900 tail -f --pid=$manager /dev/null
 wait $manager
-[ $? -eq 133 ] || { # which is how a reboot ends it
+[ $? -eq 133 ] || { # the status after a reboot
     cat "$root/root/played"
     give_up "to come to the reboot"
 }

@@ -1,4 +1,4 @@
-# What the scripts answer to clumsy use.
+# Tests how the scripts react to wrong usage.
 . "$(dirname "$0")/../box/expect.sh"
 . "$(dirname "$0")/read-only.sh"
 cd "$(dirname "$(realpath "$0")")/../.." || exit 1
@@ -7,7 +7,7 @@ work=$(mktemp -d) || exit 1
 trap 'rm -rf "$work"' EXIT
 trap 'exit 1' HUP INT TERM
 
-# Without their temporary folder they say one line and end: the next thing could be the host's.
+# Without a temporary folder they print one line and end, because the next step could harm the host.
 for script in tests/box/box.sh tests/box/journey.sh \
     tests/packaging/files.sh tests/packaging/builds.sh tests/packaging/scripts.sh \
     tests/packaging/root.sh tests/packaging/source.sh \
@@ -18,7 +18,7 @@ for script in tests/box/box.sh tests/box/journey.sh \
         "$? $(grep -c '^mktemp: ' "$work/said") $(wc -l <"$work/said")"
 done
 
-# A build as the scripts make it, of nothing.
+# A build of nothing, made as the scripts make theirs.
 mkdir -p "$work/here/scripts"
 cp scripts/common.sh "$work/here/scripts"
 printf 'cmake_minimum_required(VERSION 3.25)\nproject(nothing NONE)\n' >"$work/here/CMakeLists.txt"

@@ -1,7 +1,6 @@
 #!/bin/sh
-# What the source package of folder $1 can do in a throw-away Debian: test the packages of that folder,
-# which are installed there, and be built for another architecture, where a processor is emulated for
-# the tests.
+# In a throw-away Debian, tests the installed packages of folder $1 with their source package, and builds
+# that for another architecture, where the tests run on an emulated processor.
 here=$(dirname "$(realpath "$0")")
 . "$here/throw-away.sh"
 

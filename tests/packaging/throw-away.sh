@@ -1,4 +1,5 @@
-# Sourced: a Debian 12 below $root, which goes with $work at the end; $container runs commands in it.
+# The tests source this file. It makes a Debian 12 below $root, which is removed together with $work at
+# the end; $container runs commands in it.
 . "$here/../../scripts/bare-debian.sh"
 work=$(mktemp -d) || exit 1
 root=$work/root
