@@ -8,7 +8,6 @@ files and streams, its terminal, and the command that it starts.
 import fcntl
 import os
 import pty
-import re
 import select
 import signal
 import struct
@@ -124,18 +123,6 @@ class WithoutTerminal(unittest.TestCase):
                 self.assertEqual(done.returncode, status)
                 self.assertIn(said, done.stderr)
                 self.assertEqual(done.stderr.count("panel-emulator: "), 1)
-
-    def test_help_and_the_manual_page_list_the_same_steps(self):
-        def words(usages):
-            return sorted(re.findall(r"[a-z0-9-]+", re.sub(r"\b[A-Z][a-z]\b", "", usage).lower())
-                          for usage in usages)
-
-        helped = subprocess.run([EMULATOR, "--help"], capture_output=True, text=True, check=True)
-        steps = helped.stdout[helped.stdout.index("The steps are:"):]
-        page = Path(__file__).parents[2].joinpath("packaging/man/kestrova-journey.5")
-        listed = re.findall(r"^\.It Ic (.*)", page.read_text(encoding="ascii"), re.M)
-        self.assertGreater(len(listed), 20)
-        self.assertEqual(words(re.findall(r"^  (\S.*?)(?:  |$)", steps, re.M)), words(listed))
 
     def test_output_that_cannot_be_written_is_a_failure(self):
         with open("/dev/full", "w", encoding="ascii") as full:

@@ -1,0 +1,96 @@
+#!/usr/bin/python3
+"""Compares what the documents list and promise with the tools, the sources and the folders.
+
+The first argument is the panel-emulator whose --help counts.
+"""
+
+import os
+import re
+import subprocess
+import sys
+import unittest
+from pathlib import Path
+
+EMULATOR = sys.argv.pop(1)
+ROOT = Path(__file__).resolve().parents[1]
+
+# A figure in a document, and the constant that it states.
+FIGURES = [
+    ("packaging/man/panel-emulator.1", r"more\nthan (\d+) messages in a second",
+     "emulator/WebSession.cpp", r"mostMessagesPerSecond = (\d+)"),
+    ("packaging/man/panel-emulator.1", r"At most (\d+) connections",
+     "emulator/WebServer.cpp", r"mostSessions = (\d+)"),
+    ("packaging/man/panel-emulator.1", r"The default is (\d+) seconds",
+     "emulator/Options.h", r"limit\b.*?(\d+)"),
+    ("packaging/man/kestrova-journey.5", r"status 0 within (\d+) seconds",
+     "emulator/JourneyPlayer.cpp", r"runLimit\{(\d+)\}"),
+    ("packaging/man/kestrova-journey.5", r"up to (\d+) characters",
+     "emulator/Journey.cpp", r"longestLine = (\d+)"),
+    ("packaging/man/kestrova-journey.5", r"from 1 to ([\d,]+) steps",
+     "emulator/Journey.cpp", r"mostSteps = ([\d']+)"),
+    ("packaging/man/kestrova-panel.8", r"Bl -tag -width \"150\"\n\.It (\d+)",
+     "src/runtime/SerialLine.cpp", r"exitLineNotConfigured = (\d+)"),
+    ("docs/integration.md", r"again every (\d+) seconds",
+     "packaging/kestrova-panel.service.in", r"RestartSec=(\d+)"),
+]
+
+
+def text_of(path):
+    return (ROOT / path).read_text(encoding="utf-8")
+
+
+def help_of(tool):
+    return subprocess.run([tool, "--help"], capture_output=True, text=True, check=True).stdout
+
+
+def table_under(heading, page):
+    """The names in the first column of the table below a line."""
+    table = text_of(page).partition(heading)[2].partition("\n\n|")[2].partition("\n\n")[0]
+    return set(re.findall(r"^\|? ?`([^`]*)`", table, re.M))
+
+
+class Documents(unittest.TestCase):
+    def test_help_and_the_manual_pages_list_the_same_options(self):
+        for tool in (EMULATOR, ROOT / "box/kestrova-panel-box"):
+            page = text_of(f"packaging/man/{os.path.basename(tool)}.1")
+            listed = page.partition("The options are:")[2].partition(".El")[0]
+            described = {f"-{option}" for items in re.findall(r"^\.It (Fl .*)", listed, re.M)
+                         for option in re.findall(r"(?:Fl|,) (-[a-z-]+)", items)}
+            self.assertGreater(len(described), 5)
+            self.assertEqual(set(re.findall(r"^  (?:-h, )?(--[a-z-]+)", help_of(tool), re.M)),
+                             described)
+
+    def test_help_and_the_manual_page_list_the_same_steps(self):
+        def words(usages):
+            return sorted(re.findall(r"[a-z0-9-]+", re.sub(r"\b[A-Z][a-z]\b", "", usage).lower())
+                          for usage in usages)
+
+        steps = help_of(EMULATOR).partition("The steps are:")[2]
+        listed = re.findall(r"^\.It Ic (.*)", text_of("packaging/man/kestrova-journey.5"), re.M)
+        self.assertGreater(len(listed), 20)
+        self.assertEqual(words(re.findall(r"^  (\S.*?)(?:  |$)", steps, re.M)), words(listed))
+
+    def test_figures_are_those_of_the_sources(self):
+        for document, stated, source, constant in FIGURES:
+            with self.subTest(stated):
+                figures = [re.search(pattern, text_of(path))[1].replace(",", "").replace("'", "")
+                           for path, pattern in ((document, stated), (source, constant))]
+                self.assertEqual(*figures)
+
+    def test_every_folder_and_every_command_is_listed(self):
+        def folders(path):
+            return {entry.name for entry in (ROOT / path).iterdir() if entry.is_dir()
+                    and not re.match(r"\.|_|build|obj-", entry.name)}
+
+        commands = {f"scripts/{entry.name}" for entry in (ROOT / "scripts").iterdir()
+                    if entry.is_file() and os.access(entry, os.X_OK)}
+        commands.remove("scripts/map")  # which scripts/demo runs
+        for page, heading, there in (("README.md", "## All commands", commands),
+                                     ("README.md", "## Folders", folders(".")),
+                                     ("docs/development.md", "## Folders", folders("src"))):
+            with self.subTest(page=page, heading=heading):
+                self.assertEqual(table_under(heading, page), there)
+
+
+if __name__ == "__main__":
+    unittest.main()
