@@ -70,6 +70,11 @@ class Documents(unittest.TestCase):
         self.assertGreater(len(listed), 20)
         self.assertEqual(words(re.findall(r"^  (\S.*?)(?:  |$)", steps, re.M)), words(listed))
 
+    def test_the_journey_of_the_operators_guide_is_one_that_is_tested(self):
+        journey = text_of("docs/operator-guide.md").partition("\n```\n")[2].partition("```")[0]
+        self.assertIn("tap enter\n", journey)
+        self.assertIn(f"\n{journey}", text_of("tests/journeys/documents.journey"))
+
     def test_figures_are_those_of_the_sources(self):
         for document, stated, source, constant in FIGURES:
             with self.subTest(stated):
