@@ -1,6 +1,5 @@
 """What the kernel tells of a running process: its time, its wake-ups, its memory, its calls."""
 
-import collections
 import os
 import re
 import signal
@@ -60,12 +59,9 @@ def wake_ups(pid):
 
 def memory(pid):
     """Resident, proportional and private memory in KiB."""
-    sizes = collections.Counter()
     with open(f"/proc/{pid}/smaps_rollup") as rollup:
-        for line in rollup:
-            if match := re.match(r"(\w+):\s+(\d+) kB", line):
-                sizes[match[1].split("_")[0]] += int(match[2])
-    return sizes["Rss"], sizes["Pss"], sizes["Private"]
+        sizes = {name: int(size) for name, size in re.findall(r"^(\w+):\s+(\d+) kB", rollup.read(), re.M)}
+    return sizes["Rss"], sizes["Pss"], sizes["Private_Clean"] + sizes["Private_Dirty"]
 
 
 def calls_per_poll(pid, seconds):
