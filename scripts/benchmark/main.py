@@ -1,7 +1,7 @@
 """Measures the programs that are named and prints the table of figures; scripts/bench calls it."""
 
+import signal
 import sys
-import threading
 from collections import defaultdict
 
 import measurements
@@ -21,18 +21,9 @@ def phases():
     yield "5 ports", lambda program: measurements.growth(program, "usual", turns=4)
     yield "100 ports", lambda program: measurements.growth(
         program, "many pages", turns=4, ports=100, ports_with_address=100)
-    yield "1,000 ports, and faults", large_and_faulty
-
-
-def large_and_faulty(program):
-    """Both at once: one takes seconds of commands, the other says nothing about time."""
-    samples = {}
-    worker = threading.Thread(target=lambda: samples.update(measurements.faults(program)))
-    worker.start()
-    samples.update(measurements.growth(program, "many ports", turns=2, ports=1000,
-                                       ports_with_address=100, interfaces_bytes=65536))
-    worker.join()
-    return samples
+    yield "1,000 ports", lambda program: measurements.growth(
+        program, "many ports", turns=2, ports=1000, ports_with_address=100, interfaces_bytes=65536)
+    yield "faults", measurements.faults
 
 
 def main(markdown, *programs):
@@ -50,6 +41,9 @@ def main(markdown, *programs):
             page.write(report.as_page(samples[0], others, PICTURE))
 
 
+# However it is ended, what it has started ends with it.
+for number in (signal.SIGTERM, signal.SIGHUP):
+    signal.signal(number, signal.default_int_handler)
 try:
     main(sys.argv[1] == "--markdown", *sys.argv[2:])
 except RuntimeError as fault:

@@ -38,7 +38,8 @@ def wait_until(happened, what):
 
 
 class Running:
-    """A process of the bench's own, with what it started; ended and waited for at the end."""
+    """A process of the bench's own, with what it started; ended and waited for at the end, also when
+    it does not begin its work."""
 
     def __init__(self, command, **options):
         self.said = tempfile.TemporaryFile()
@@ -46,6 +47,11 @@ class Running:
                                         stderr=subprocess.STDOUT, **options)
 
     def __enter__(self):
+        try:
+            self.wait_for_begin()
+        except BaseException:
+            self.__exit__()
+            raise
         return self
 
     def __exit__(self, *_):
@@ -79,7 +85,10 @@ class Panel(Running):
         super().__init__([
             EMULATOR, "--journey", journey, "--trace", self.trace_path, "--limit", str(LONGEST_WAIT),
             "--", *(command or [BOX, "--appliance", folder, "--", "/usr/bin/python3", "-ISc", START])])
-        self.pid = None if command else self.find_program()
+        self.is_in_box = not command
+
+    def wait_for_begin(self):
+        self.pid = self.find_program() if self.is_in_box else None
 
     def start_time(self):
         """When the unit's command was given; the program has its name a moment before its variables."""
@@ -118,8 +127,10 @@ class OwnLine(Running):
                           "/usr/bin/python3", "-ISc", START])
         self.answering = threading.Thread(target=self.answer)
         self.answering.start()
+
+    def wait_for_begin(self):
         self.pid = self.find_program()
-        wait_until(lambda: self.requests > 1, "the first key request")
+        wait_until(lambda: self.requests > 0, "the first key request")
 
     def answer(self):
         chance = random.Random(1)
