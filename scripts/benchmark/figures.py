@@ -75,7 +75,7 @@ FIGURES = [
         "It takes one ifconfig for each port, and no key is read meanwhile.",
         "The panel stands still for so long: an appliance with so many ports should not refresh often."]),
     Figure("garbled answers: CPU", "Garbled answers: processor share", "%", None,
-           "Noise on the serial line costs no more than rest does."),
+           "Noise ends each wait for a key at once, so it costs more than rest does, and still next to nothing."),
     Figure("garbled answers: memory", "Garbled answers: memory gained", "KiB", 0,
            "Noise does not make the program grow."),
     Figure("garbled answers: at work", "Garbled answers: still asks for keys", "", 1,

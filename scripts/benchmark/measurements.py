@@ -20,7 +20,7 @@ FIRST_PAGE = "cabinetDevice"  # the second row of the first page that a start sh
 PANELS_AT_ONCE = 10
 IDLE_TIME = 20  # seconds
 TRACED_TIME = 7  # seconds under strace, which slows the program down
-FAULT_TIME = 8  # seconds
+FAULT_TIME = 5  # seconds
 SIGNALS_PER_SECOND = 2000
 
 IDLE = f'expect "Kestrova (TM)" "{FIRST_PAGE}"\ntap up\ntap down\nexpect "Kestrova (TM)" "{FIRST_PAGE}"'
@@ -63,6 +63,8 @@ def idle(program):
         time.sleep(IDLE_TIME)
         for panel, (cpu, wake_ups) in zip(panels, before):
             turns = panel.trace().requests_since(begin)
+            if not turns:
+                raise RuntimeError("the idle program asked for no key")
             samples["idle wake-ups"].append((process.wake_ups(panel.pid) - wake_ups) / turns)
             samples["idle CPU"].append((process.cpu_seconds(panel.pid) - cpu) / turns * 1e6)
             samples["idle bytes"].append(len(panel.trace().sent_since(begin)) / turns)
@@ -120,15 +122,21 @@ def growth(program, name, turns, **size):
 
 
 def under_fault(samples, name, running, fault, is_at_work):
-    """What a fault costs while `fault` goes on; then the program has to be there still."""
-    begin = time.monotonic()
-    cpu = process.cpu_seconds_with_commands(running.pid)
-    resident = process.memory(running.pid)[0]
-    fault(begin + FAULT_TIME)
-    share = (process.cpu_seconds_with_commands(running.pid) - cpu) / (time.monotonic() - begin)
+    """What a fault costs while `fault` goes on, and whether the program is at work afterwards; one
+    that has ended costs nothing that could be told."""
+    try:
+        begin = time.monotonic()
+        cpu = process.cpu_seconds_with_commands(running.pid)
+        resident = process.memory(running.pid)[0]
+        fault(begin + FAULT_TIME)
+        share = (process.cpu_seconds_with_commands(running.pid) - cpu) / (time.monotonic() - begin)
+        gained = process.memory(running.pid)[0] - resident
+    except (FileNotFoundError, ProcessLookupError):
+        samples[f"{name}: at work"].append(0)
+        return
     samples[f"{name}: CPU"].append(share * 100)
-    samples[f"{name}: memory"].append(process.memory(running.pid)[0] - resident)
-    samples[f"{name}: at work"].append(is_at_work())
+    samples[f"{name}: memory"].append(gained)
+    samples[f"{name}: at work"].append(int(is_at_work()))
 
 
 def wait(end):
@@ -150,11 +158,16 @@ def faults(program):
             panel.time_of(FIRST_PAGE)
 
             def signals(end):
-                while (now := time.monotonic()) < end:
+                due = time.monotonic()
+                while due < end:
                     os.kill(panel.pid, signal.SIGUSR1)
-                    time.sleep(max(0, now + 1 / SIGNALS_PER_SECOND - time.monotonic()))
+                    due += 1 / SIGNALS_PER_SECOND
+                    time.sleep(max(0, due - time.monotonic()))
 
             def draws():
-                return panel.redraw_since(time.monotonic()) is not None
+                try:
+                    return bool(panel.redraw_since(time.monotonic()))
+                except RuntimeError:
+                    return False
             under_fault(samples, "signals", panel, signals, draws)
     return samples

@@ -46,10 +46,10 @@ def cpu_seconds(pid):
 
 
 def cpu_seconds_with_commands(pid):
-    """Of the process and the commands that it has waited for, to the kernel's tick."""
+    """Of the process, and to the kernel's tick of the commands that it has waited for."""
     with open(f"/proc/{pid}/stat") as statistics:
         fields = statistics.read().rpartition(")")[2].split()
-    return sum(map(int, fields[11:15])) / TICKS_PER_SECOND
+    return cpu_seconds(pid) + sum(map(int, fields[13:15])) / TICKS_PER_SECOND
 
 
 def wake_ups(pid):

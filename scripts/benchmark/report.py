@@ -17,16 +17,26 @@ def number(value):
     return f"{value:,.{digits}f}"
 
 
+def median(values):
+    return statistics.median(values) if values else None
+
+
+def ratio(value, to):
+    return f"{value / to:.2f}" if value is not None and to else ""
+
+
 def spread(values):
-    """Smallest, median, 99th percentile where there is one, and largest."""
+    """Smallest, median, 99th percentile where there is one, and largest; nothing of no values."""
     ordered = sorted(values)
+    if not ordered:
+        return (None,) * 4
     enough = len(ordered) >= PERCENTILE_SAMPLES
-    return (ordered[0], statistics.median(ordered),
+    return (ordered[0], median(ordered),
             ordered[len(ordered) * 99 // 100] if enough else None, ordered[-1])
 
 
 def floor_of(figure, samples):
-    return statistics.median(samples[figure.floor]) if isinstance(figure.floor, str) else figure.floor
+    return median(samples[figure.floor]) if isinstance(figure.floor, str) else figure.floor
 
 
 def rows(samples, others):
@@ -35,14 +45,13 @@ def rows(samples, others):
     yield head + (["other's median", "this / other"] if others else [])
     for figure in FIGURES:
         values = samples[figure.key]
-        least, median, high, most = spread(values)
+        least, middle, high, most = spread(values)
         floor = floor_of(figure, samples)
-        ratio = f"{median / floor:.2f}" if floor else ""
-        row = [figure.title, figure.unit, str(len(values)), number(least), number(median),
-               number(high), number(most), number(floor), ratio]
+        row = [figure.title, figure.unit, str(len(values)), number(least), number(middle),
+               number(high), number(most), number(floor), ratio(middle, floor)]
         if others:
-            other = statistics.median(others[figure.key])
-            row += [number(other), f"{median / other:.2f}" if other else ""]
+            other = median(others[figure.key])
+            row += [number(other), ratio(middle, other)]
         yield row
 
 
