@@ -31,7 +31,7 @@ constexpr std::array verbs{
     Verb{"hostname NAME", "set the host name, also for after a reboot"},
     Verb{"file PATH TEXT", "write a file that consists of this text"},
     Verb{"remove PATH", "remove a file"},
-    Verb{"refresh", "have the program list its ports anew"},
+    Verb{"refresh", "have the program list its ports again"},
     Verb{"reboot", "end the program and start it again"},
     Verb{"has port NAME ADDRESS/PREFIX|-", "check that the port has this address, or none"},
     Verb{"has gateway ADDRESS PORT", "check the default route"},
