@@ -1,8 +1,8 @@
 #include "World.h"
 
 #include <algorithm>
-#include <array>
 #include <gtest/gtest.h>
+#include <set>
 
 #include <cerrno>
 #include <cstdio>
@@ -25,7 +25,7 @@ namespace {
 constexpr int panelDescriptor = 4242;
 constexpr Micros pollTimeout = 500ms, answerTime = 25ms, turnPause = 100ms;
 
-// The program looks for its files there, whether or not the appliance has them.
+// The program looks for its files there, whether the appliance has them or not.
 bool isAppliances(const std::string &path) {
     return (boost::starts_with(path, "/etc/") || boost::starts_with(path, "/opt/kestrova/")) &&
            !boost::starts_with(path, SOURCE "/");
@@ -43,9 +43,9 @@ int interrupted() {
     return -1;
 }
 
-const std::array<std::string, 5> knownFiles = {"/etc/ma-platform", "/etc/network/interfaces",
-                                               "/etc/resolv.conf", "/opt/kestrova/seq.site_conn",
-                                               "/opt/kestrova/config/nis.config"};
+const std::set<std::string> knownFiles = {"/etc/ma-platform", "/etc/network/interfaces",
+                                          "/etc/resolv.conf", "/opt/kestrova/seq.site_conn",
+                                          "/opt/kestrova/config/nis.config"};
 
 } // namespace
 
@@ -56,7 +56,8 @@ void World::pass(Micros time, bool forAnswer) {
         now = std::min(end, wakeAt());
 }
 
-// The calls of the program, and of nobody else, are led here by the linker, which gives the names.
+// The linker directs the calls of the program, and only those, to these functions and dictates
+// their names.
 // NOLINTBEGIN(bugprone-reserved-identifier,readability-inconsistent-declaration-parameter-name)
 extern "C" {
 
@@ -169,15 +170,15 @@ int __wrap_pclose(FILE *pipe) {
     return fclose(pipe);
 }
 
-// The standard library's file streams are opened inside it, out of the linker's reach, by this.
+// The standard library opens its file streams with this function, internally, where the linker
+// cannot redirect the call.
 FILE *fopen64(const char *path, const char *mode) {
     using Open = FILE *(*)(const char *, const char *);
     static const auto realOpen = reinterpret_cast<Open>(dlsym(RTLD_NEXT, "fopen64"));
     const std::string name = path;
     if (!isAppliances(name))
         return realOpen(path, mode);
-    EXPECT_NE(std::find(knownFiles.begin(), knownFiles.end(), name), knownFiles.end())
-        << "a file that no appliance knows: " << name;
+    EXPECT_TRUE(knownFiles.count(name)) << "a file that no appliance knows: " << name;
     world().events.push_back("open " + name);
     const auto file = world().appliance.fact("file " + name);
     return file ? openContents(*file) : nullptr;
