@@ -98,7 +98,8 @@ class Browser:
     def saved(self):
         """The journey that the page saves."""
         self.driver.find_element(By.ID, "save").click()
-        self.wait("saved", self.file.exists)
+        # The browser makes the file before it has what belongs into it.
+        self.wait("saved", lambda: self.file.exists() and self.file.stat().st_size)
         return self.file.read_text(encoding="ascii")
 
 
