@@ -13,6 +13,7 @@ from pathlib import Path
 
 EMULATOR = sys.argv.pop(1)
 ROOT = Path(__file__).resolve().parents[1]
+PAGES = [ROOT / "README.md", *sorted(ROOT.glob("docs/*.md"))]
 
 # A figure in a document, and the constant that it states.
 FIGURES = [
@@ -47,6 +48,12 @@ def table_under(heading, page):
     """The names in the first column of the table below a line."""
     table = text_of(page).partition(heading)[2].partition("\n\n|")[2].partition("\n\n")[0]
     return set(re.findall(r"^\|? ?`([^`]*)`", table, re.M))
+
+
+def anchors_of(page):
+    """Its headings, as links name them."""
+    headings = re.findall("^#+ (.*)", page.read_text(encoding="utf-8"), re.M)
+    return {re.sub(r"[^\w -]", "", heading).lower().replace(" ", "-") for heading in headings}
 
 
 class Documents(unittest.TestCase):
@@ -95,6 +102,15 @@ class Documents(unittest.TestCase):
                                      ("docs/development.md", "## Folders", folders("src"))):
             with self.subTest(page=page, heading=heading):
                 self.assertEqual(table_under(heading, page), there)
+
+    def test_every_link_leads_somewhere(self):
+        for page in PAGES:
+            for link in re.findall(r"\]\(([^)]+)\)", page.read_text(encoding="utf-8")):
+                path, _, anchor = link.partition("#")
+                target = (page.parent / path).resolve() if path else page
+                with self.subTest(page=page.name, link=link):
+                    self.assertTrue(target.exists())
+                    self.assertTrue(not anchor or anchor in anchors_of(target))
 
 
 if __name__ == "__main__":
