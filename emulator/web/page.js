@@ -10,7 +10,7 @@ let state = null;     // the last that came
 let opened = null;    // how much had been recorded when the page was opened
 let font = null;
 
-// The glass. All measures are in dots; each dot is a square with a thin gap behind it.
+// The display. All measures are in dots; a dot is a square with a thin gap behind it.
 
 const columns = 16, rows = 2, margin = 4;
 const cellWidth = 6, cellHeight = 10, glyphWidth = 5, glyphHeight = 8;
@@ -45,9 +45,10 @@ function drawGlass() {
   }));
 }
 
-// What is said beside it.
+// The texts beside the display.
 
-// As the program counts: a key acts, rests for four polls, and then repeats or counts as long.
+// The program counts the polls of a held key: the first one acts, the next four rest, and from then on
+// the key repeats or is long.
 function meaning(key, polls) {
   if (polls === 0) return "not asked for yet";
   if (polls === 1) return "press";
@@ -66,8 +67,8 @@ function describeKey({ down, counted, polls }) {
 
 let sayTimer = 0, changedSince = null;
 
-// A screen takes the line a fifth of a second: what is half drawn is not read out. A key that runs
-// changes the display all the time: then it is read out once a second.
+// Drawing a screen takes a fifth of a second, and a screen that is half drawn should not be read out.
+// A key that repeats changes the display all the time, so the rows are then read out once a second.
 function sayRows() {
   changedSince ??= performance.now();
   clearTimeout(sayTimer);
@@ -184,8 +185,8 @@ for (const button of keyButtons) {
   });
 }
 
-// What is recorded begins with the emulator; the page gives what came since it was opened, behind
-// the two lines that every journey begins with.
+// The recording begins when the emulator starts. The page saves what has been added since the page was
+// opened, behind the two lines with which every journey begins.
 element("save").addEventListener("click", async () => {
   try {
     const text = state.journey ?? await fetched("journey", "text");
