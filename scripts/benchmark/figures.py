@@ -1,7 +1,7 @@
 """The table of figures: what is measured, its floor, and what it means to an operator."""
 
 from dataclasses import dataclass
-from typing import Optional, Union
+from typing import Union
 
 from linetrace import BYTE_TIME
 
