@@ -2,8 +2,12 @@
 
 #include "runtime/LcdPanel.h"
 #include "runtime/String.h"
+#include "runtime/TextFile.h"
 #include "runtime/runCommand.h"
 #include "runtime/splitString.h"
+
+#include <fstream>
+#include <gtest/gtest-spi.h>
 
 namespace {
 
@@ -93,6 +97,35 @@ FRESH_TEST(Runtime, AllOutputIsCaptured) {
     EXPECT_EQ(world().events.back(), "start `later` &");
     world().shellWorks = false;
     EXPECT_EQ(runCommand("many", true), "ERROR");
+}
+
+FRESH_TEST(Runtime, AFileIsReadLineByLineWhateverItHolds) {
+    const std::string path = "/etc/resolv.conf", longLine(100'000, 'x');
+    const auto linesOf = [&](const std::string &contents) {
+        world().appliance.act({"file", path, contents});
+        TextFile file(path.c_str());
+        std::vector<std::string> lines;
+        while (const auto line = file.nextLine())
+            lines.push_back(*line);
+        EXPECT_EQ(file.nextLine(), std::nullopt);
+        return lines;
+    };
+    using Lines = std::vector<std::string>;
+    EXPECT_EQ(linesOf(""), Lines{});
+    EXPECT_EQ(linesOf("a\n\n\n"), (Lines{"a", "", ""}));
+    EXPECT_EQ(linesOf("a\r\n\xFF\nno line feed"), (Lines{"a\r", "\xFF", "no line feed"}));
+    EXPECT_EQ(linesOf(std::string("a\0b\n\0", 5)),
+              (Lines{std::string("a\0b", 3), std::string("\0", 1)}));
+    EXPECT_EQ(linesOf(longLine + "\n" + longLine), (Lines{longLine, longLine}));
+
+    world().directories = {path};
+    EXPECT_TRUE(TextFile(path.c_str()).isOpen());
+    EXPECT_EQ(linesOf("a\n"), Lines{});
+    world().directories.clear();
+    world().appliance.act({"remove", path});
+    EXPECT_FALSE(TextFile(path.c_str()).isOpen());
+    EXPECT_EQ(TextFile(path.c_str()).nextLine(), std::nullopt);
+    EXPECT_NONFATAL_FAILURE(std::ifstream("/etc/resolv.conf"), "the machine's own file");
 }
 
 FRESH_TEST(Runtime, TrimmingStripsBothEnds) {

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <gtest/gtest.h>
-#include <set>
 
 #include <cerrno>
 #include <cstdio>
@@ -25,10 +24,16 @@ namespace {
 constexpr int panelDescriptor = 4242;
 constexpr Micros pollTimeout = 500ms, answerTime = 25ms, turnPause = 100ms;
 
-// The program looks for its files there, whether the appliance has them or not.
-bool isAppliances(const std::string &path) {
-    return (boost::starts_with(path, "/etc/") || boost::starts_with(path, "/opt/kestrova/")) &&
-           !boost::starts_with(path, SOURCE "/");
+// Opens a file for a library, but none where an appliance has its files.
+FILE *openForLibrary(const char *function, const char *path, const char *mode) {
+    if ((boost::starts_with(path, "/etc/") || boost::starts_with(path, "/opt/kestrova/")) &&
+        !boost::starts_with(path, SOURCE "/")) {
+        ADD_FAILURE() << "the machine's own file would be read: " << path;
+        errno = ENOENT;
+        return nullptr;
+    }
+    using Open = FILE *(*)(const char *, const char *);
+    return reinterpret_cast<Open>(dlsym(RTLD_NEXT, function))(path, mode);
 }
 
 FILE *openContents(const std::string &contents) {
@@ -61,6 +66,7 @@ void World::pass(Micros time, bool forAnswer) {
 // NOLINTBEGIN(bugprone-reserved-identifier,readability-inconsistent-declaration-parameter-name)
 extern "C" {
 
+FILE *__real_fopen(const char *path, const char *mode);
 ssize_t __real_read(int descriptor, void *buffer, size_t size);
 ssize_t __real_write(int descriptor, const void *bytes, size_t size);
 
@@ -170,18 +176,23 @@ int __wrap_pclose(FILE *pipe) {
     return fclose(pipe);
 }
 
-// The standard library opens its file streams with this function, internally, where the linker
-// cannot redirect the call.
-FILE *fopen64(const char *path, const char *mode) {
-    using Open = FILE *(*)(const char *, const char *);
-    static const auto realOpen = reinterpret_cast<Open>(dlsym(RTLD_NEXT, "fopen64"));
-    const std::string name = path;
-    if (!isAppliances(name))
-        return realOpen(path, mode);
-    EXPECT_TRUE(knownFiles.count(name)) << "a file that no appliance knows: " << name;
-    world().events.push_back("open " + name);
-    const auto file = world().appliance.fact("file " + name);
+FILE *__wrap_fopen(const char *path, const char *mode) {
+    EXPECT_STREQ(mode, "r");
+    EXPECT_TRUE(knownFiles.count(path)) << "a file that no appliance knows: " << path;
+    world().events.push_back(std::string("open ") + path);
+    if (world().directories.count(path))
+        return __real_fopen("/", mode);
+    const auto file = world().appliance.fact(std::string("file ") + path);
     return file ? openContents(*file) : nullptr;
+}
+
+// The linker cannot redirect the calls that a library makes for the program. Which of these two
+// opens a file stream depends on the standard library's version.
+FILE *fopen(const char *path, const char *mode) {
+    return openForLibrary("fopen", path, mode);
+}
+FILE *fopen64(const char *path, const char *mode) {
+    return openForLibrary("fopen64", path, mode);
 }
 
 } // extern "C"

@@ -1,7 +1,7 @@
 // The world in which the tests run the program: an appliance of plain text, the emulated panel at
 // the far end of the serial line, and a clock that moves only when the program waits or runs a
 // command. The world replaces the POSIX calls of the program and has all its files: one that the
-// world does not have is missing, even if the machine has it.
+// world does not have is missing, and a test that would read one of the machine instead fails.
 #pragma once
 
 #include "Appliance.h"
@@ -13,6 +13,7 @@
 
 #include <chrono>
 #include <functional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -23,6 +24,7 @@ struct World {
     bool shellWorks = true;
     bool clockWorks = true;
     bool lineTakesBytes = true;
+    std::set<std::string> directories; // in place of these files
 
     emulator::Display display;
     emulator::Keypad keypad{[this](emulator::Key key) {

@@ -1,9 +1,9 @@
 #include "netconfig/NetworkConfig.h"
 
 #include "runtime/ConfigurationScript.h"
+#include "runtime/TextFile.h"
 #include "runtime/beginsWith.h"
 
-#include <fstream>
 #include <utility>
 
 namespace {
@@ -28,32 +28,32 @@ void NetworkConfig::load() {
 }
 
 bool NetworkConfig::loadStanza() {
-    std::ifstream file("/etc/network/interfaces");
-    if (!file)
+    TextFile file("/etc/network/interfaces");
+    if (!file.isOpen())
         return false;
 
     // The blank at the end keeps "eth1" from finding the stanza of "eth10".
     const std::string key = "iface " + name + " ";
-    std::string line;
-    while (std::getline(file, line) && !beginsWith(line, key)) {
-    }
-    if (!file)
+    auto line = file.nextLine();
+    while (line && !beginsWith(*line, key))
+        line = file.nextLine();
+    if (!line)
         return true; // no stanza: a static port without settings
-    dhcp = beginsWith(afterLastSpace(line), "dhcp");
+    dhcp = beginsWith(afterLastSpace(*line), "dhcp");
     if (dhcp)
         return true;
 
     // Only an empty line ends a stanza, and a keyword counts anywhere in a line: a hardware address
     // is taken for an address, and what follows without an empty line is read into this port.
-    while (std::getline(file, line) && !line.empty()) {
-        if (contains(line, "#"))
+    for (line = file.nextLine(); line && !line->empty(); line = file.nextLine()) {
+        if (contains(*line, "#"))
             continue;
-        if (contains(line, "address")) {
-            address = afterLastSpace(line);
-        } else if (contains(line, "netmask")) {
-            netmask = afterLastSpace(line);
-        } else if (contains(line, "gateway")) {
-            gateway = afterLastSpace(line);
+        if (contains(*line, "address")) {
+            address = afterLastSpace(*line);
+        } else if (contains(*line, "netmask")) {
+            netmask = afterLastSpace(*line);
+        } else if (contains(*line, "gateway")) {
+            gateway = afterLastSpace(*line);
         }
     }
     return true;
@@ -61,10 +61,10 @@ bool NetworkConfig::loadStanza() {
 
 void NetworkConfig::loadDnsServers() {
     const std::string key = "nameserver ";
-    std::ifstream file("/etc/resolv.conf");
-    for (std::string line; std::getline(file, line);) {
-        if (beginsWith(line, key))
-            addDns(line.substr(key.length()));
+    TextFile file("/etc/resolv.conf");
+    while (const auto line = file.nextLine()) {
+        if (beginsWith(*line, key))
+            addDns(line->substr(key.length()));
     }
 }
 

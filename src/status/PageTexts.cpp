@@ -1,26 +1,26 @@
 #include "status/PageTexts.h"
 
+#include "runtime/TextFile.h"
 #include "runtime/beginsWith.h"
 #include "runtime/runCommand.h"
 #include "status/NetworkPorts.h"
 
-#include <fstream>
 #include <optional>
 
 namespace {
 
 // The rest of the first line that begins with `prefix`.
-std::optional<std::string> lineAfter(std::ifstream &file, std::string_view prefix) {
-    for (std::string line; std::getline(file, line);) {
-        if (beginsWith(line, prefix))
-            return line.substr(prefix.length());
+std::optional<std::string> lineAfter(TextFile &file, std::string_view prefix) {
+    while (const auto line = file.nextLine()) {
+        if (beginsWith(*line, prefix))
+            return line->substr(prefix.length());
     }
     return std::nullopt;
 }
 
 std::string connectedServer() {
-    std::ifstream status("/opt/kestrova/seq.site_conn");
-    std::ifstream config("/opt/kestrova/config/nis.config");
+    TextFile status("/opt/kestrova/seq.site_conn");
+    TextFile config("/opt/kestrova/config/nis.config");
     if (!lineAfter(status, "Connection OK"))
         return "";
 

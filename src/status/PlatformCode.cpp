@@ -1,14 +1,10 @@
 #include "status/PlatformCode.h"
 
+#include "runtime/TextFile.h"
 #include "runtime/beginsWith.h"
 
-#include <fstream>
-#include <string>
-
 PlatformCode detectPlatform() {
-    std::ifstream file("/etc/ma-platform");
-    std::string line;
-    std::getline(file, line);
+    const std::string line = TextFile("/etc/ma-platform").nextLine().value_or("");
 
     // A q700 counts as a q70, because its name begins with "q70". The order of these lines must
     // stay.
