@@ -60,7 +60,7 @@ class WebSession : public std::enable_shared_from_this<WebSession> {
     const WebGate &gate;
     WebService &service;
     std::function<void(const WebSession &)> onClosed;
-    boost::beast::websocket::stream<Stream> socket;
+    boost::beast::websocket::stream<Stream, false> socket; // states are not compressed
     boost::asio::steady_timer writeLimit;
     boost::beast::flat_buffer received;
     boost::beast::http::request_parser<boost::beast::http::empty_body> parser;
