@@ -12,15 +12,15 @@ constexpr std::int32_t lastOctet = 3;
 
 } // namespace
 
-AddressEditor::AddressEditor(Menu *screen, const EditedAddress &edited)
-    : panel(LcdPanel::instance()), drawn(screen), ownAddress(edited), address(&edited) {}
+AddressEditor::AddressEditor(const EditedAddress &edited)
+    : drawn(this), ownAddress(edited), address(&edited) {}
 
 void AddressEditor::editForOneVisit(const EditedAddress &edited, ServerIndex index) {
     address = &edited;
     serverIndex = index;
 }
 
-void AddressEditor::display() {
+void AddressEditor::display(MenuContext *) {
     if (!drawn.claimDrawing() || config == nullptr)
         return;
     std::string text = address->shown(*config, serverIndex);
@@ -31,12 +31,12 @@ void AddressEditor::display() {
     octetIndex = 0;
 }
 
-void AddressEditor::onUp() {
+void AddressEditor::onUp(MenuContext *) {
     if (actsRestsAndRepeats(panel, keyUp))
         changeOctet(incrementOctet(octet()));
 }
 
-void AddressEditor::onDown() {
+void AddressEditor::onDown(MenuContext *) {
     if (actsRestsAndRepeats(panel, keyDown))
         changeOctet(decrementOctet(octet()));
 }

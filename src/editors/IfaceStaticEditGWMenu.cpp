@@ -1,3 +1,0 @@
-#include "editors/IfaceStaticEditGWMenu.h"
-
-IfaceStaticEditGWMenu::IfaceStaticEditGWMenu() : editor(this, portGateway) {}

@@ -1,3 +1,0 @@
-#include "editors/IfaceStaticEditIPMenu.h"
-
-IfaceStaticEditIPMenu::IfaceStaticEditIPMenu() : editor(this, portAddress) {}

@@ -1,3 +1,0 @@
-#include "editors/IfaceStaticEditNMMenu.h"
-
-IfaceStaticEditNMMenu::IfaceStaticEditNMMenu() : editor(this, portNetmask) {}
