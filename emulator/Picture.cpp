@@ -26,8 +26,7 @@ std::string number(int value) {
 }
 
 std::string printable(std::string text) {
-    std::replace_if(
-        text.begin(), text.end(), [](char c) { return !isPrintable(c); }, '?');
+    std::replace_if(text.begin(), text.end(), [](char c) { return !isPrintable(c); }, '?');
     return text;
 }
 

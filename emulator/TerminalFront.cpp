@@ -240,8 +240,7 @@ void TerminalFront::drawGlass(TimePoint now) const {
     const attr_t colours = has_colors() ? static_cast<attr_t>(COLOR_PAIR(glassColours)) : A_NORMAL;
     for (int row = 0; row < Display::rowCount; row++) {
         std::string text = display.visibleRow(row);
-        std::replace_if(
-            text.begin(), text.end(), [](char c) { return !isPrintable(c); }, '?');
+        std::replace_if(text.begin(), text.end(), [](char c) { return !isPrintable(c); }, '?');
         put({glassAt.y + 1 + row, glassAt.x + 1}, text, colours);
     }
     const bool on = now.time_since_epoch() / blinkTime % 2 == 0;

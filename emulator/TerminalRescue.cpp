@@ -67,7 +67,7 @@ TerminalRescue::TerminalRescue() {
         throw std::runtime_error("this kind of terminal cannot place its cursor: check TERM");
     prepare();
     del_curterm(cur_term);
-    struct sigaction action {};
+    struct sigaction action{};
     action.sa_handler = restore;
     sigemptyset(&action.sa_mask);
     for (std::size_t i = 0; i < crashes.size(); i++)

@@ -21,8 +21,7 @@ std::vector<std::filesystem::path> journeys() {
 
 std::string titleOf(const testing::TestParamInfo<std::filesystem::path> &test) {
     std::string title = test.param.stem();
-    std::replace_if(
-        title.begin(), title.end(), [](char c) { return isalnum(c) == 0; }, '_');
+    std::replace_if(title.begin(), title.end(), [](char c) { return isalnum(c) == 0; }, '_');
     return title;
 }
 
