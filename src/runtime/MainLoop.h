@@ -16,6 +16,8 @@ class MainLoop {
     /// The first is a `std::function` because an `instance()` returns a pointer to its own class;
     /// the second is a plain one because a signal handler calls it.
     MainLoop(const std::function<Menu *()> &firstScreen, void (*requestRefresh)());
+    MainLoop(const MainLoop &) = delete;
+    MainLoop &operator=(const MainLoop &) = delete;
 
     /// One turn: waits at most 500 ms for a key, hands it to the current screen, lets the screen
     /// that is current then draw, and sleeps 100 ms. A signal cuts either wait short.
