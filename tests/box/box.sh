@@ -56,7 +56,7 @@ TEXT
     # A fault in the appliance's files is reported before the box is made.
     while read -r file content; do
         cp -R "$copy"/box/appliance/. broken
-        printf "$content" >"broken/$file"
+        printf %b "$content" >"broken/$file"
         box --no-tty --appliance broken -- true >/dev/null 2>said
         expect "status of $file: $content" 125 "$?"
         expect "lines for $file: $content" 1 "$(grep -c "broken/$file" said)"
@@ -70,11 +70,11 @@ links eth0 192.0.2.1/33\n
 links eth0 -\neth0 -
 links lo -
 links eth012345678ab -
-links \377 -
+links \0377 -
 links bridge0 - dhcp 192.0.2.1/24
 etc/hostname
 etc/hostname two words\n
-etc/hostname \377
+etc/hostname \0377
 TEXT
     cp -R "$copy"/box/appliance/. broken
     printf '# no line feed at the end\neth0 -\neth9 -' >broken/links
@@ -124,4 +124,4 @@ TEXT
 
     expect "host after all that" "$before" "$(host_state)"
 done
-exit $failed
+finish

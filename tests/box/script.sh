@@ -13,7 +13,7 @@ apply() { $script "$@" 2>/dev/null; echo $?; }
 address() { ip -4 -o addr show dev "$1" | awk '{ print $4 }'; }
 
 while read -r wanted arguments; do
-    expect "$arguments" "$wanted" "$(apply $arguments)"
+    expect "$arguments" "$wanted" "$(eval "apply $arguments")"
 done <<'TEXT'
 2 iface --name eth9 --dhcp
 2 iface --name bridge0 --dhcp
@@ -30,15 +30,17 @@ done <<'TEXT'
 TEXT
 expect "reasons logged" 11 "$(grep -c ' refused: ' ${script%.py}.log)"
 
-set_eth0="iface --name eth0 --ipaddress 192.0.2.77 --netmask 255.255.255.0 --gateway 192.0.2.254"
+set_eth0() {
+    apply iface --name eth0 --ipaddress 192.0.2.77 --netmask 255.255.255.0 --gateway 192.0.2.254 "$@"
+}
 chmod a-w /etc/network
-expect "unwritable" 1 "$(apply $set_eth0 --dns 9.9.9.9)"
+expect "unwritable" 1 "$(set_eth0 --dns 9.9.9.9)"
 chmod u+w /etc/network
 expect "files after failures" "" "$(for file in network/interfaces resolv.conf hostname; do
     diff $delivered/$file /etc/$file; done)"
 expect "state after failures" "192.0.2.10/24 rack12-monitor-west" "$(address eth0) $(hostname)"
 
-expect "static" 0 "$(apply $set_eth0 --dns 9.9.9.9 --dns 1.1.1.1)"
+expect "static" 0 "$(set_eth0 --dns 9.9.9.9 --dns 1.1.1.1)"
 expect "one stanza replaced" "" "$(sed 's/2\.10/2.77/; s/2\.1$/2.254/' \
     $delivered/network/interfaces | diff - /etc/network/interfaces)"
 expect "servers" "search example.net nameserver 9.9.9.9 nameserver 1.1.1.1" \
@@ -58,7 +60,7 @@ expect "back to static" 0 "$(apply iface --name eth1 --ipaddress 10.1.1.1 --netm
 expect "lease given up" "10.1.1.1/8 0" "$(address eth1) $(pidof udhcpc | wc -w)"
 
 echo chatters >/run/box/script-mode
-expect "chatter" "Reloading the network configuration 0" "$(apply $set_eth0 | xargs)"
+expect "chatter" "Reloading the network configuration 0" "$(set_eth0 | xargs)"
 echo hangs 60 >/run/box/script-mode
-expect "hang" 124 "$(timeout 1 $script $set_eth0; echo $?)"
-exit $failed
+expect "hang" 124 "$(timeout 1 $script iface --name eth0 --dhcp; echo $?)"
+finish

@@ -9,7 +9,7 @@ trap 'exit 1' HUP INT TERM
 try() {
     folder=$work/$1
     shift
-    read_only "$work" -- cmake -S "$source" -B "$folder" -G Ninja \
+    read_only --bind "$work" "$work" -- cmake -S "$source" -B "$folder" -G Ninja \
         -DCMAKE_INSTALL_PREFIX="$folder/prefix" -DCMAKE_CXX_FLAGS=-O0 "$@" >"$work/log" 2>&1 || {
         failed=1
         echo "FAILED to configure with $*"
@@ -17,9 +17,9 @@ try() {
     }
 }
 installed() {
-    read_only "$work" -- cmake --build "$folder" --target install -j"$(nproc)" >"$work/log" 2>&1 ||
-        cat "$work/log"
-    (cd "$folder/prefix" && ls -d bin/* sbin/* 2>/dev/null | xargs)
+    read_only --bind "$work" "$work" -- \
+        cmake --build "$folder" --target install -j"$(nproc)" >"$work/log" 2>&1 || cat "$work/log"
+    (cd "$folder/prefix" && find bin sbin -type f 2>/dev/null | sort | xargs)
 }
 source=$1
 without_tests=-DCMAKE_DISABLE_FIND_PACKAGE_GTest=ON # as if GoogleTest were not installed
@@ -31,4 +31,4 @@ expect "program and tools" "bin/kestrova-panel-box bin/panel-emulator sbin/kestr
     "$(installed)"
 try tests -DKESTROVA_TOOLS=OFF -DBUILD_TESTING=ON
 try release -DBUILD_TESTING=ON -DCMAKE_BUILD_TYPE=Release -DKESTROVA_WERROR=OFF
-exit $failed
+finish

@@ -7,7 +7,8 @@ trap 'exit 1' HUP INT TERM
 prefix=$work$2
 unit=$prefix/lib/systemd/system/kestrova-panel.service
 
-DESTDIR=$work read_only "$work" "$1" -- cmake --install "$1" >/dev/null
+DESTDIR=$work read_only --bind "$work" "$work" --bind "$1" "$1" -- \
+    cmake --install "$1" >/dev/null
 expect "its path in the service" "$2/sbin/kestrova-panel" "$(sed -n 's/^ExecStart=.* //p' "$unit")"
 expect "the service's faults" "" "$(systemd-analyze verify --man=no "$unit" 2>&1)"
 expect "rights that the script is said not to have" "" \
@@ -25,4 +26,4 @@ printf '%s\n' 'expect "Kestrova (TM)" "cabinetDevice"' \
         "$prefix/bin/kestrova-panel-box" -- "$prefix/sbin/kestrova-panel" >"$work/said" 2>&1
 expect "status of the tools where they lie" 0 $?
 [ $failed -eq 0 ] || cat "$work/exposure" "$work/said"
-exit $failed
+finish

@@ -2,7 +2,6 @@
 . "$(dirname "$0")/../box/expect.sh"
 . "$(dirname "$0")/read-only.sh"
 cd "$(dirname "$(realpath "$0")")/../.." || exit 1
-here=$PWD
 work=$(mktemp -d) || exit 1
 trap 'rm -rf "$work"' EXIT
 trap 'exit 1' HUP INT TERM
@@ -43,4 +42,4 @@ one_line() { echo "$? $(grep -c "^me: .*$work/copy/build" "$work/said") $(wc -l 
 in_copy='cd "$1" && me=me && . scripts/common.sh && in_build build true'
 read_only -- sh -c "exec 2>&1; TMPDIR=/dev/shm; export TMPDIR; $in_copy" sh "$work/copy" >"$work/said"
 expect "a build that cannot be written to" "1 1 1" "$(one_line)"
-exit $failed
+finish
