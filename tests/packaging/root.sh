@@ -71,9 +71,9 @@ TEXT
 } >"$root/root/all.journey"
 
 # No service manager runs, as when an image is built.
-must $container sh -c "$apt install /root/kestrova-panel_*.deb && dpkg --purge kestrova-panel"
+must in_system "apt install /root/kestrova-panel_*.deb && dpkg --purge kestrova-panel"
 expect "left after an installation without a service manager" "" "$(leftovers)"
-must $container sh -c "$apt install /root/before/*.deb && $apt install /root/kestrova-panel-tools_*.deb"
+must in_system "apt install /root/before/*.deb && apt install /root/kestrova-panel-tools_*.deb"
 expect "enabled" kestrova-panel.service "$(ls "$root/etc/systemd/system/dev-ttyS1.device.wants")"
 
 cp -R "$root"/usr/share/kestrova-panel/box/appliance/[eo]* "$root"
@@ -106,4 +106,4 @@ boot
 expect "name after the reboot" rack12-monitor-wesub "$(inside hostname)"
 must inside dpkg --purge kestrova-panel kestrova-panel-tools
 expect "left behind" "" "$(leftovers)"
-exit $failed
+finish

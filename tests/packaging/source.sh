@@ -6,10 +6,10 @@ here=$(dirname "$(realpath "$0")")
 
 must bare_debian "$root" debian-12-minbase
 cp "$1"/* "$root/root"
-must $container sh -c "$apt install autopkgtest && autopkgtest /root/*.changes -- null"
+must in_system "apt install autopkgtest && autopkgtest /root/*.changes -- null"
 grep -m 1 '^journeys .*PASS' "$work/log"
-must $container sh -c "dpkg --add-architecture arm64 && $apt install crossbuild-essential-arm64 &&
-    $apt build-dep --host-architecture arm64 --build-profiles cross /root/*.dsc &&
+must in_system "dpkg --add-architecture arm64 && apt install crossbuild-essential-arm64 &&
+    apt build-dep --host-architecture arm64 --build-profiles cross /root/*.dsc &&
     cd /root && dpkg-source -x *.dsc source &&
     cd source && dpkg-buildpackage --host-arch arm64 --build-profiles=cross --build=binary"
 sed -n 's/^\(.* tests passed\)/arm64: \1/p' "$work/log"

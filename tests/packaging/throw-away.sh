@@ -1,6 +1,6 @@
 # The tests source this file. It makes a Debian 12 below $root, which is removed together with $work at
-# the end; $container runs commands in it.
-. "$here/../../scripts/bare-debian.sh"
+# the end; `in_system` runs commands in it.
+. "${here:?}/../../scripts/bare-debian.sh"
 work=$(mktemp -d) || exit 1
 root=$work/root
 trap 'rm -rf "$work"' EXIT
@@ -8,7 +8,12 @@ trap 'exit 1' HUP INT TERM
 
 export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
 container="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --directory=$root"
-apt='apt-get -q update && DEBIAN_FRONTEND=noninteractive apt-get -q -y --no-install-recommends'
+in_system() {
+    $container sh -c "apt() {
+        apt-get -q update &&
+            DEBIAN_FRONTEND=noninteractive apt-get -q -y --no-install-recommends \"\$@\"
+    }; $1"
+}
 
 give_up() {
     echo "FAILED $*"
