@@ -1,5 +1,6 @@
 # The scripts source this file in the checkout's folder. It contains steps that show what they do, and
 # builds. $me is the name of the script, which begins its messages.
+: "${me:?}"
 
 # What the current step has printed. The file no longer has a name, so it disappears with the script.
 printed=$(mktemp) || exit 1
