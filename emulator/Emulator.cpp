@@ -24,7 +24,7 @@ constexpr std::chrono::milliseconds longestTurn{1000};
 
 // The address has a line of its own, so that other programs can read it.
 void announce(const WebServer &server) {
-    std::cout << server.address() << std::endl;
+    std::cout << server.address() << '\n' << std::flush;
     if (server.isOpenToOthers())
         std::cerr
             << "panel-emulator: other machines can open this page, too, at this machine's "

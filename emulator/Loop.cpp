@@ -66,7 +66,7 @@ void Readable::await() {
                                   return;
                               await();
                               // Kept, because the handler may destroy this object.
-                              Loop &itsLoop = loop;
+                              const Loop &itsLoop = loop;
                               const Loop::Handler call = handler;
                               call();
                               itsLoop.afterEvent();

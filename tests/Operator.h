@@ -16,11 +16,15 @@
 
 /// Defines a test of a program that has just been started; its body follows.
 #define FRESH_TEST(suite, name)                                                                    \
-    static void check##suite##name();                                                              \
-    TEST(suite, name) {                                                                            \
-        EXPECT_TRUE(holdsInFreshProgram(check##suite##name)) << "see above";                       \
+    namespace {                                                                                    \
+    struct Check##suite##name {                                                                    \
+        static void run();                                                                         \
+    };                                                                                             \
     }                                                                                              \
-    static void check##suite##name()
+    TEST(suite, name) {                                                                            \
+        EXPECT_TRUE(holdsInFreshProgram(Check##suite##name::run)) << "see above";                  \
+    }                                                                                              \
+    void Check##suite##name::run()
 
 /// An appliance with one port, for tests that count pages.
 void standardAppliance();

@@ -39,7 +39,7 @@ FILE *openForLibrary(const char *function, const char *path, const char *mode) {
 FILE *openContents(const std::string &contents) {
     FILE *file = fdopen(memfd_create("contents", 0), "w+");
     fwrite(contents.data(), 1, contents.length(), file);
-    rewind(file);
+    fseek(file, 0, SEEK_SET);
     return file;
 }
 

@@ -15,10 +15,10 @@ namespace {
 //
 // Those who trace the program's commands on an appliance recognise this one by its text, including
 // the runs of blanks. Its length is asserted because nothing else would reveal a lost blank.
-constexpr std::string_view listCommand =
+constexpr const char *listCommand =
     "echo \"`ifconfig -s |       sed 1d |       egrep -v 'lo|ani|docker|v|ipsec_|ssl_' |"
     "       awk '{ print $1 } '`\\neth4\\neth5\" |       sort -u | tr '\n' ','";
-static_assert(listCommand.length() == 151);
+static_assert(std::string_view(listCommand).length() == 151);
 
 constexpr std::string_view nameSeparator = ",";
 
@@ -45,7 +45,7 @@ bool alwaysHasPage(const std::string &name) {
 } // namespace
 
 std::vector<std::string> listPortsWithPage() {
-    const QLX::String<char> listing = runCommand(listCommand.data(), true);
+    const QLX::String<char> listing = runCommand(listCommand, true);
     std::vector<std::string> paged;
     for (const auto &name : splitString(listing, QLX::String<char>(nameSeparator))) {
         const bool hasAddress = !interfaceAddress(name).empty();

@@ -41,7 +41,7 @@ TEST(TerminalKeys, KnowsKeysAndTheMouseAndPassesOverEverythingElse) {
 
 TEST(TerminalKeys, WaitsForTheRestOfASequenceButNotForEver) {
     TerminalKeys keys;
-    TimePoint now;
+    const TimePoint now;
     EXPECT_EQ(letters(keys.take("\033", now)), "");
     EXPECT_EQ(letters(keys.look(now + 24ms)), "");
     EXPECT_EQ(letters(keys.look(now + 25ms)), "x");
