@@ -10,7 +10,7 @@ trap 'exit 1' HUP INT TERM
 for script in tests/box/box.sh tests/box/journey.sh \
     tests/packaging/files.sh tests/packaging/builds.sh tests/packaging/scripts.sh \
     tests/packaging/root.sh tests/packaging/source.sh \
-    scripts/bench scripts/demo scripts/package scripts/test scripts/test-fresh \
+    scripts/bench scripts/check scripts/demo scripts/package scripts/test scripts/test-fresh \
     scripts/test-packages scripts/test-web; do
     TMPDIR=/nonexistent read_only -- timeout 30 sh $script >"$work/said" 2>&1
     expect "$script without a temporary folder" "1 1 1" \
