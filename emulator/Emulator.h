@@ -1,16 +1,16 @@
 #pragma once
 
-#include "emulator/ChildProcess.h"
-#include "emulator/CommandOutput.h"
-#include "emulator/Display.h"
-#include "emulator/JourneyOperator.h"
-#include "emulator/Keypad.h"
-#include "emulator/Line.h"
-#include "emulator/Loop.h"
 #include "emulator/Options.h"
-#include "emulator/Recorder.h"
-#include "emulator/TerminalFront.h"
-#include "emulator/WebFront.h"
+#include "emulator/base/Loop.h"
+#include "emulator/command/ChildProcess.h"
+#include "emulator/command/CommandOutput.h"
+#include "emulator/journey/JourneyOperator.h"
+#include "emulator/journey/Recorder.h"
+#include "emulator/line/Line.h"
+#include "emulator/panel/Display.h"
+#include "emulator/panel/Keypad.h"
+#include "emulator/terminal/TerminalFront.h"
+#include "emulator/web/WebFront.h"
 
 #include <fstream>
 #include <memory>

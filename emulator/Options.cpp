@@ -1,8 +1,8 @@
 #include "emulator/Options.h"
 
-#include "emulator/Number.h"
-#include "emulator/StepTable.h"
-#include "emulator/helpEntry.h"
+#include "emulator/base/Number.h"
+#include "emulator/base/helpEntry.h"
+#include "emulator/journey/StepTable.h"
 
 #include <algorithm>
 #include <array>

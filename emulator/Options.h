@@ -1,6 +1,6 @@
 #pragma once
 
-#include "emulator/Clock.h"
+#include "emulator/base/Clock.h"
 
 #include <boost/asio/ip/tcp.hpp>
 

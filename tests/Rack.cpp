@@ -1,6 +1,6 @@
 #include "Rack.h"
 
-#include "emulator/FileDescriptor.h"
+#include "emulator/base/FileDescriptor.h"
 
 #include <boost/algorithm/string/erase.hpp>
 

@@ -5,7 +5,7 @@
 
 #include "Operator.h"
 
-#include "emulator/JourneyPlayer.h"
+#include "emulator/journey/JourneyPlayer.h"
 
 #include <functional>
 #include <string>

@@ -6,8 +6,8 @@
 
 #include "Appliance.h"
 
-#include "emulator/Display.h"
-#include "emulator/Keypad.h"
+#include "emulator/panel/Display.h"
+#include "emulator/panel/Keypad.h"
 
 #include <boost/algorithm/string/trim.hpp>
 

@@ -1,6 +1,6 @@
-#include "emulator/Font.h"
-#include "emulator/JourneyPlayer.h"
-#include "emulator/Line.h"
+#include "emulator/journey/JourneyPlayer.h"
+#include "emulator/line/Line.h"
+#include "emulator/panel/Font.h"
 
 #include <gtest/gtest.h>
 

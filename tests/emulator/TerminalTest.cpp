@@ -1,6 +1,6 @@
 // A person at a terminal: what the bytes of the terminal mean, and what typing does to the keypad.
-#include "emulator/Finger.h"
-#include "emulator/TerminalKeys.h"
+#include "emulator/operators/Finger.h"
+#include "emulator/terminal/TerminalKeys.h"
 
 #include <gtest/gtest.h>
 

@@ -1,0 +1,156 @@
+#include "emulator/command/ChildProcess.h"
+
+#include <fcntl.h>
+#include <sys/prctl.h>
+#include <sys/syscall.h>
+#include <sys/wait.h>
+
+#include <array>
+#include <cerrno>
+#include <csignal>
+#include <cstring>
+#include <ctime>
+#include <system_error>
+
+namespace emulator {
+
+namespace {
+
+constexpr std::chrono::seconds gracePeriod{2};
+constexpr std::chrono::seconds killPeriod{1};
+constexpr timespec endingLook{0, 10'000'000}; // how often to see whether the group is empty
+constexpr int cannotRun = 127;
+
+int shellStatus(int raw) {
+    return WIFEXITED(raw) ? WEXITSTATUS(raw) : 128 + WTERMSIG(raw);
+}
+
+// Makes the kernel send SIGTERM to this process when `parent` has ended.
+void endWith(pid_t parent) {
+    prctl(PR_SET_PDEATHSIG, SIGTERM);
+    // The parent may have ended before this request.
+    if (getppid() != parent)
+        _exit(cannotRun);
+}
+
+[[noreturn]] void become(std::vector<std::string> &command, pid_t guard) {
+    endWith(guard);
+    setpgid(0, 0);
+    sigset_t none;
+    sigemptyset(&none);
+    sigprocmask(SIG_SETMASK, &none, nullptr);
+    std::vector<char *> argv;
+    argv.reserve(command.size() + 1);
+    for (std::string &word : command)
+        argv.push_back(word.data());
+    argv.push_back(nullptr);
+    execvp(argv[0], argv.data());
+    dprintf(STDERR_FILENO, "panel-emulator: cannot run %s: %s\n", argv[0], strerror(errno));
+    _exit(cannotRun);
+}
+
+// Waits until the command and its group have ended, and ends them at SIGTERM as far as possible: a
+// process that has become root cannot be killed, and a zombie whose parent has left the group
+// stays.
+int waitForGroup(pid_t command, const sigset_t &awaited) {
+    std::optional<int> status;
+    std::optional<TimePoint> giveUp;
+    for (;;) {
+        const int signal =
+            giveUp ? sigtimedwait(&awaited, nullptr, &endingLook) : sigwaitinfo(&awaited, nullptr);
+        int raw = 0;
+        pid_t ended = 0;
+        while ((ended = waitpid(-1, &raw, WNOHANG)) > 0)
+            if (ended == command)
+                status = shellStatus(raw);
+        const bool empty = kill(-command, 0) != 0;
+        if (status && empty)
+            return *status;
+        if (!giveUp && (signal == SIGTERM || status)) {
+            kill(-command, SIGTERM);
+            giveUp = Clock::now() + gracePeriod;
+        } else if (giveUp && Clock::now() >= *giveUp) {
+            kill(-command, SIGKILL);
+        }
+        if (giveUp && Clock::now() >= *giveUp + killPeriod)
+            kill(getpid(), SIGKILL); // which tells the emulator
+    }
+}
+
+[[noreturn]] void guardCommand(std::vector<std::string> &command, int output, int report,
+                               pid_t parent) {
+    // Nothing but SIGKILL ends the guard before the command. The signals are blocked before
+    // anything else, so that no request to end the command gets lost.
+    sigset_t all;
+    sigfillset(&all);
+    sigprocmask(SIG_BLOCK, &all, nullptr);
+    // Otherwise the emulator's handlers would swallow a signal that comes before the command
+    // starts.
+    for (int number = 1; number < NSIG; number++)
+        signal(number, SIG_DFL);
+    endWith(parent);
+    setsid(); // a background group of the terminal would be stopped when it reads or writes there
+    prctl(PR_SET_CHILD_SUBREAPER, 1); // so that orphans of the group do not linger as zombies
+    dup2(open("/dev/null", O_RDONLY | O_CLOEXEC), STDIN_FILENO);
+    if (output >= 0) {
+        dup2(output, STDOUT_FILENO);
+        dup2(output, STDERR_FILENO);
+    }
+    const pid_t self = getpid();
+    const pid_t pid = fork();
+    if (pid == 0)
+        become(command, self);
+    if (pid > 0)
+        setpgid(pid, pid); // as the command does too, so that the group exists from here on
+    if (write(report, &pid, sizeof pid) < 0 || pid < 0)
+        _exit(cannotRun);
+    // The line must hang up with the emulator, not with the guard.
+    close_range(STDERR_FILENO + 1, ~0U, 0);
+    sigset_t awaited;
+    sigemptyset(&awaited);
+    sigaddset(&awaited, SIGCHLD);
+    sigaddset(&awaited, SIGTERM);
+    _exit(waitForGroup(pid, awaited));
+}
+
+} // namespace
+
+ChildProcess::ChildProcess(Loop &loop, std::vector<std::string> words, int output) {
+    std::array<int, 2> ends{};
+    if (pipe2(ends.data(), O_CLOEXEC) != 0)
+        throw std::system_error(errno, std::generic_category(), "cannot open a pipe");
+    const FileDescriptor pidReport(ends[0]);
+    FileDescriptor report(ends[1]);
+    const pid_t self = getpid();
+    guard = fork();
+    if (guard == 0)
+        guardCommand(words, output, report.get(), self);
+    report.reset();
+    if (guard < 0 || read(pidReport.get(), &command, sizeof command) != sizeof command ||
+        command < 0)
+        throw std::system_error(errno, std::generic_category(), "cannot start a process");
+    // By its number, because the C library's header for it cannot be used in C++.
+    guardEnd = FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, guard, 0)));
+    guardEndWait = std::make_unique<Readable>(loop, guardEnd.get(), [this] { status(); });
+}
+
+ChildProcess::~ChildProcess() {
+    end();
+}
+
+void ChildProcess::end() {
+    if (!status())
+        kill(guard, SIGTERM);
+}
+
+std::optional<int> ChildProcess::status() {
+    int raw = 0;
+    if (!result && waitpid(guard, &raw, WNOHANG) == guard) {
+        result = shellStatus(raw);
+        hasGuardGivenUp = WIFSIGNALED(raw);
+        guardEndWait.reset();
+    }
+    return result;
+}
+
+} // namespace emulator

@@ -1,0 +1,249 @@
+#include "emulator/journey/JourneyPlayer.h"
+
+#include <fstream>
+#include <stdexcept>
+#include <utility>
+
+namespace emulator {
+
+namespace {
+
+constexpr std::chrono::seconds runLimit{60};
+
+[[noreturn]] void fail(const std::string &reason) {
+    throw std::runtime_error(reason);
+}
+
+std::string described(const step::ExpectCursor &cursor) {
+    return "row " + std::to_string(cursor.row) + ", column " + std::to_string(cursor.column) +
+           (cursor.blinking ? ", on" : ", off");
+}
+
+step::ExpectCursor cursorOf(const Display &display) {
+    return {display.cursorRow(), display.cursorColumn(), display.cursorBlinking()};
+}
+
+} // namespace
+
+JourneyPlayer::JourneyPlayer(Journey itsJourney, Panel itsPanel, Surroundings &itsSurroundings,
+                             std::ostream &itsOutput, Clock::duration firstLimit,
+                             std::optional<std::filesystem::path> picturesFolder)
+    : journey(std::move(itsJourney)), panel(itsPanel), surroundings(itsSurroundings),
+      output(itsOutput), limit(firstLimit), pictures(std::move(picturesFolder)) {}
+
+bool JourneyPlayer::advance(TimePoint time) {
+    now = time;
+    while (next < journey.steps().size()) {
+        const Step &step = journey.steps()[next];
+        try {
+            if (!hasBegun) {
+                deadline = now + limit;
+                requestsBefore = panel.keypad.requests();
+            }
+            const bool begins = !std::exchange(hasBegun, true);
+            if (!std::visit([&](const auto &action) { return play(action, begins); },
+                            step.action)) {
+                if (now >= deadline)
+                    fail(
+                        std::visit([&](const auto &action) { return delay(action); }, step.action));
+                return false;
+            }
+        } catch (const std::runtime_error &error) {
+            throw std::runtime_error(journey.place(step) + error.what());
+        }
+        hasBegun = false;
+        next++;
+    }
+    return true;
+}
+
+void JourneyPlayer::goTo(std::size_t step) {
+    next = step;
+    hasBegun = false;
+    for (std::size_t before = 0; before < step; before++) {
+        if (const auto *set = std::get_if<step::Limit>(&journey.steps()[before].action))
+            limit = set->time;
+    }
+}
+
+bool JourneyPlayer::play(const step::Tap &tap, bool begins) {
+    if (begins)
+        tapsLeft = tap.count;
+    else if (!panel.keypad.settled())
+        return false;
+    if (tap.until && shows(*tap.until))
+        return true;
+    if (tapsLeft == 0 && tap.until)
+        fail("after " + std::to_string(tap.count) +
+             " taps the panel still does not show what is expected\n" +
+             delay(step::Expect{*tap.until}));
+    if (tapsLeft == 0)
+        return true;
+    tapsLeft--;
+    deadline = now + limit;
+    panel.keypad.tap(tap.key);
+    return false;
+}
+
+bool JourneyPlayer::play(const step::Keys &sequence, bool begins) {
+    if (begins) {
+        nextStroke = 0;
+    } else {
+        if (!isAnswered(sequence.strokes[nextStroke].polls))
+            return false;
+        panel.keypad.release();
+        if (!panel.keypad.settled())
+            return false;
+        nextStroke++;
+    }
+    if (nextStroke == sequence.strokes.size())
+        return true;
+    const Stroke &stroke = sequence.strokes[nextStroke];
+    awaitAnswers();
+    // After a single poll the key has to come up at once.
+    stroke.polls == 1 ? panel.keypad.tap(stroke.key) : panel.keypad.press(stroke.key);
+    return false;
+}
+
+bool JourneyPlayer::play(const step::Hold &hold, bool begins) {
+    if (begins) {
+        awaitAnswers();
+        panel.keypad.press(hold.key);
+    }
+    return isAnswered(hold.polls);
+}
+
+bool JourneyPlayer::play(const step::Release &, bool begins) {
+    if (begins)
+        panel.keypad.release();
+    return panel.keypad.settled();
+}
+
+bool JourneyPlayer::play(const step::Wait &wait, bool begins) {
+    if (begins)
+        deadline = now + wait.time;
+    return now >= deadline;
+}
+
+bool JourneyPlayer::play(const step::Expect &expect, bool) {
+    return shows(expect.sight);
+}
+
+bool JourneyPlayer::play(const step::ExpectCursor &cursor, bool) {
+    const step::ExpectCursor actual = cursorOf(panel.display);
+    return actual.row == cursor.row && actual.column == cursor.column &&
+           actual.blinking == cursor.blinking;
+}
+
+bool JourneyPlayer::play(const step::TakePicture &picture, bool) {
+    const Picture taken(panel.display);
+    output << taken.text() << std::flush;
+    if (!pictures)
+        return true;
+    const std::filesystem::path path = *pictures / (picture.name + ".svg");
+    std::ofstream file(path, std::ios::binary);
+    file << taken.svg();
+    file.close();
+    if (!file)
+        fail("cannot write " + path.string());
+    return true;
+}
+
+bool JourneyPlayer::play(const step::Say &say, bool) {
+    output << say.text << '\n' << std::flush;
+    return true;
+}
+
+bool JourneyPlayer::play(const step::Limit &newLimit, bool) {
+    limit = newLimit.time;
+    return true;
+}
+
+bool JourneyPlayer::play(const step::Run &run, bool begins) {
+    if (begins) {
+        deadline = now + runLimit;
+        output.flush();
+        surroundings.start(run);
+    }
+    return hasSucceeded();
+}
+
+bool JourneyPlayer::play(const step::Appliance &appliance, bool begins) {
+    if (begins) {
+        deadline = now + runLimit;
+        output.flush();
+        surroundings.start(appliance);
+    }
+    return hasSucceeded();
+}
+
+bool JourneyPlayer::play(const TestAction &action, bool begins) {
+    if (begins) {
+        const std::string fault = surroundings.act(action);
+        if (!fault.empty())
+            fail(fault);
+    }
+    return hasSucceeded();
+}
+
+std::string JourneyPlayer::delay(const step::Expect &expect) const {
+    const Sight &sight = expect.sight;
+    return "the panel does not show what is expected\nwanted:\n" +
+           Picture({sight.row0, sight.row1.value_or("(any)")}).text() + shown();
+}
+
+std::string JourneyPlayer::delay(const step::ExpectCursor &cursor) const {
+    return "the cursor is not where it is expected\nwanted: " + described(cursor) +
+           "\nis at:  " + described(cursorOf(panel.display)) + "\n" + shown();
+}
+
+std::string JourneyPlayer::delay(const step::Run &) const {
+    return "the command is still running after 60 s";
+}
+
+std::string JourneyPlayer::delay(const step::Appliance &) const {
+    return "the appliance is still busy with it after 60 s";
+}
+
+std::string JourneyPlayer::delay(const TestAction &) const {
+    return "this has not happened\n" + shown();
+}
+
+void JourneyPlayer::awaitAnswers() {
+    deadline = now + limit;
+    answersBefore = answersLast = panel.keypad.answered();
+}
+
+bool JourneyPlayer::isAnswered(int polls) {
+    const unsigned long answers = panel.keypad.answered();
+    if (answers != answersLast)
+        deadline = now + limit;
+    answersLast = answers;
+    return answers - answersBefore >= static_cast<unsigned long>(polls);
+}
+
+bool JourneyPlayer::hasSucceeded() {
+    const std::optional<int> status = surroundings.status();
+    if (status && *status != 0)
+        fail("it ended with status " + std::to_string(*status));
+    return status.has_value();
+}
+
+bool JourneyPlayer::shows(const Sight &sight) const {
+    const Display &display = panel.display;
+    return display.visibleRow(0) == sight.row0 &&
+           (!sight.row1 || display.visibleRow(1) == *sight.row1);
+}
+
+std::string JourneyPlayer::shown() const {
+    return "shown:\n" + Picture(panel.display).text();
+}
+
+std::string JourneyPlayer::unansweredKey() const {
+    const bool isAsked = panel.keypad.requests() != requestsBefore;
+    return (isAsked ? "the program asks for keys, but does not read the answers\n"
+                    : "the program does not ask for keys\n") +
+           shown();
+}
+
+} // namespace emulator

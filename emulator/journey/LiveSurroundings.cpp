@@ -1,0 +1,27 @@
+#include "emulator/journey/LiveSurroundings.h"
+
+namespace emulator {
+
+void LiveSurroundings::start(const step::Run &run) {
+    process = std::make_unique<ChildProcess>(
+        loop, std::vector<std::string>{"/bin/sh", "-c", run.command});
+}
+
+void LiveSurroundings::start(const step::Appliance &appliance) {
+    std::vector<std::string> command{program, "--enter", pid, "--", "appliance"};
+    command.insert(command.end(), appliance.words.begin(), appliance.words.end());
+    process = std::make_unique<ChildProcess>(loop, command);
+}
+
+std::optional<int> LiveSurroundings::status() {
+    const std::optional<int> status = process->status();
+    if (status)
+        process.reset();
+    return status;
+}
+
+std::string LiveSurroundings::act(const TestAction &) {
+    return "this can be played in tests only"; // never: such a step is refused when it is read
+}
+
+} // namespace emulator

@@ -1,0 +1,396 @@
+#include "emulator/journey/StepTable.h"
+
+#include "emulator/base/Number.h"
+#include "emulator/base/helpEntry.h"
+#include "emulator/journey/ApplianceVerbs.h"
+#include "emulator/panel/Display.h"
+#include "emulator/panel/Font.h"
+
+#include <algorithm>
+#include <stdexcept>
+#include <utility>
+
+namespace emulator {
+
+namespace {
+
+constexpr int mostPolls = 100'000;
+constexpr int mostTapsUntil = 100;
+constexpr int mostRepeats = 255; // of a byte
+constexpr double mostSeconds = 86'400;
+constexpr std::string_view blanks = " \t\r";
+
+[[noreturn]] void reject(const std::string &reason) {
+    throw std::invalid_argument(reason);
+}
+
+struct Word {
+    std::string text;
+    bool isQuoted;
+};
+
+// Takes the quoted word off the front of `rest`, which begins with its quote.
+Word takeQuoted(std::string_view &rest) {
+    Word word{"", true};
+    for (std::size_t at = 1; at < rest.size(); at++) {
+        if (rest[at] == '"') {
+            rest.remove_prefix(at + 1);
+            return word;
+        }
+        if (rest[at] != '\\') {
+            word.text += rest[at];
+            continue;
+        }
+        at++;
+        if (at < rest.size() && std::string_view("\"\\n").find(rest[at]) == std::string_view::npos)
+            reject("in quotes, a backslash can only be followed by \", \\ or n");
+        if (at < rest.size())
+            word.text += rest[at] == 'n' ? '\n' : rest[at];
+    }
+    reject("a quote is not closed");
+}
+
+// What follows a step's name: words, which are taken one after the other, or the rest of the line.
+class Arguments {
+  public:
+    explicit Arguments(std::string_view text) : rest(text) { skipBlanks(); }
+
+    bool isEmpty() const { return rest.empty() || rest.front() == '#'; }
+    bool nextIs(std::string_view word) const {
+        return std::string_view(rest).substr(0, rest.find_first_of(blanks)) == word;
+    }
+    bool nextIsNumber() const {
+        return !rest.empty() && rest.front() >= '0' && rest.front() <= '9';
+    }
+
+    std::string take() {
+        if (isEmpty())
+            reject("");
+        Word word;
+        if (rest.front() == '"') {
+            word = takeQuoted(rest);
+        } else {
+            const std::size_t end = std::min(rest.find_first_of(blanks), rest.size());
+            word = {std::string(rest.substr(0, end)), false};
+            rest.remove_prefix(end);
+        }
+        if (!rest.empty() && blanks.find(rest.front()) == std::string_view::npos)
+            reject("there is no blank after a quoted word");
+        skipBlanks();
+        return word.text;
+    }
+    void take(std::string_view word) {
+        if (!nextIs(word))
+            reject("");
+        take();
+    }
+    std::string takeRest() { return std::string(std::exchange(rest, {})); }
+
+    int takeInteger(int least, int most, const std::string &what) {
+        return parseNumber(take(), least, most, what);
+    }
+    Clock::duration takeSeconds() {
+        return seconds(parseNumber(take(), 0.0, mostSeconds, "a number of seconds"));
+    }
+    int takePolls() { return takeInteger(1, mostPolls, "a number of polls"); }
+
+    Key takeKey() {
+        const std::string word = take();
+        const auto *found = std::find_if(keys.begin(), keys.end(),
+                                         [&](const KeyTraits &key) { return key.name == word; });
+        if (found == keys.end())
+            reject("'" + word + "' is not a key: up, down, enter or escape");
+        return found->key;
+    }
+
+    std::string takeRow() {
+        std::string row = take();
+        if (row.size() > Display::visibleColumns)
+            reject("\"" + row + "\" is longer than a row");
+        if (!std::all_of(row.begin(), row.end(), isPrintable))
+            reject("\"" + row + "\" can never be seen: the panel shows only printable ASCII");
+        row.resize(Display::visibleColumns, ' ');
+        return row;
+    }
+    Sight takeSight() {
+        Sight sight{takeRow(), std::nullopt};
+        if (!isEmpty())
+            sight.row1 = takeRow();
+        return sight;
+    }
+
+    // Bytes in hexadecimal, to the end of the line; 20*40 is the byte 20 forty times.
+    std::string takeBytes() {
+        std::string bytes;
+        while (!isEmpty()) {
+            const std::string word = take();
+            const std::size_t star = std::min(word.find('*'), word.size());
+            const int times = star == word.size()
+                                  ? 1
+                                  : parseNumber(word.substr(star + 1), 1, mostRepeats, "a count");
+            bytes.append(static_cast<std::size_t>(times),
+                         static_cast<char>(parseByte(word.substr(0, star))));
+        }
+        return bytes;
+    }
+
+  private:
+    void skipBlanks() { rest.remove_prefix(std::min(rest.find_first_not_of(blanks), rest.size())); }
+
+    std::string_view rest;
+};
+
+Action parseTap(Arguments &words) {
+    step::Tap tap{words.takeKey(), 1, std::nullopt};
+    const bool isCounted = words.nextIsNumber();
+    if (isCounted)
+        tap.count = words.takeInteger(1, mostPolls, "a number of taps");
+    if (words.isEmpty())
+        return tap;
+    words.take("until");
+    tap.until = words.takeSight();
+    if (!isCounted)
+        tap.count = mostTapsUntil;
+    return tap;
+}
+
+Key keyOfLetter(char letter) {
+    for (const KeyTraits &key : keys) {
+        if (key.letter == letter)
+            return key.key;
+    }
+    reject(std::string("'") + letter + "' is not the letter of a key: u, d, e or x");
+}
+
+Action parseKeys(Arguments &words) {
+    constexpr std::string_view digits = "0123456789";
+    step::Keys sequence;
+    do {
+        const std::string word = words.take();
+        for (std::size_t at = 0; at < word.size();) {
+            Stroke stroke{keyOfLetter(word[at++]), 1};
+            const std::size_t end = std::min(word.find_first_not_of(digits, at), word.size());
+            if (end > at)
+                stroke.polls =
+                    parseNumber(word.substr(at, end - at), 1, mostPolls, "a number of polls");
+            at = end;
+            sequence.strokes.push_back(stroke);
+        }
+    } while (!words.isEmpty());
+    return sequence;
+}
+
+Action parseHold(Arguments &words) {
+    const Key key = words.takeKey();
+    return step::Hold{key, words.takePolls()};
+}
+
+Action parseRelease(Arguments &) {
+    return step::Release{};
+}
+
+Action parseWait(Arguments &words) {
+    return step::Wait{words.takeSeconds()};
+}
+
+Action parseExpect(Arguments &words) {
+    return step::Expect{words.takeSight()};
+}
+
+Action parseExpectCursor(Arguments &words) {
+    step::ExpectCursor cursor{};
+    cursor.row = words.takeInteger(0, Display::rowCount - 1, "a row");
+    cursor.column = words.takeInteger(0, Display::columns - 1, "a column");
+    const std::string state = words.take();
+    if (state != "on" && state != "off")
+        reject("'" + state + "' is not on or off");
+    cursor.blinking = state == "on";
+    return cursor;
+}
+
+Action parsePicture(Arguments &words) {
+    const std::string name = words.take();
+    const bool isPlain =
+        name.find_first_not_of("abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ"
+                               "0123456789-_.") == std::string::npos;
+    if (!isPlain || name.empty() || name.front() == '.')
+        reject("'" + name + "' is not a name for a picture: use letters, digits, - _ and .");
+    return step::TakePicture{name};
+}
+
+Action parseSay(Arguments &words) {
+    return step::Say{words.takeRest()};
+}
+
+Action parseLimit(Arguments &words) {
+    return step::Limit{words.takeSeconds()};
+}
+
+Action parseRun(Arguments &words) {
+    step::Run run{words.takeRest()};
+    if (run.command.empty())
+        reject("");
+    return run;
+}
+
+Action parseAppliance(Arguments &words) {
+    step::Appliance appliance;
+    do {
+        appliance.words.push_back(words.take());
+    } while (!words.isEmpty());
+    checkVerb(appliance.words);
+    return appliance;
+}
+
+Action parseScene(Arguments &words) {
+    return TestAction(step::Scene{words.takeRest()});
+}
+
+Action parsePrints(Arguments &words) {
+    step::Prints prints{words.take(), ""};
+    prints.output = words.take();
+    return TestAction(prints);
+}
+
+Action parseAnswer(Arguments &words) {
+    return TestAction(step::Answer{words.takeBytes()});
+}
+
+Action parseExpectSent(Arguments &words) {
+    return TestAction(step::ExpectSent{words.takeBytes()});
+}
+
+Action parseExpectPause(Arguments &words) {
+    step::ExpectPause pause{words.takeSeconds(), {}};
+    pause.sight = words.takeSight();
+    return TestAction(pause);
+}
+
+Action parseExpectRun(Arguments &words) {
+    step::ExpectRun run{words.take(), {}};
+    run.sight = words.takeSight();
+    return TestAction(run);
+}
+
+struct StepKind {
+    std::string_view name;
+    std::string_view arguments;
+    std::string_view help; // lines, separated by line feeds
+    Stage stage;           // where it can be played: Stage::panel means everywhere
+    Action (*parse)(Arguments &);
+};
+
+constexpr std::array stepKinds{
+    StepKind{"tap", "KEY [N] [until \"ROW 0\" [\"ROW 1\"]]",
+             "press KEY for exactly one key request, and wait until a whole poll\n"
+             "has gone by without it; do this N times. With until, stop as soon\n"
+             "as the panel shows these rows, and fail after N taps (default: 100)",
+             Stage::panel, parseTap},
+    StepKind{"keys", "LETTERS...",
+             "tap many keys: u, d, e and x stand for up, down, enter and escape.\n"
+             "With a number behind its letter, a key is held for that many key\n"
+             "requests",
+             Stage::panel, parseKeys},
+    StepKind{"hold", "KEY POLLS",
+             "press KEY and wait until it has answered that many key requests;\n"
+             "the key stays down, and another hold goes on counting",
+             Stage::panel, parseHold},
+    StepKind{"release", "",
+             "let the key come up, and wait until a whole poll has gone by without\n"
+             "it",
+             Stage::panel, parseRelease},
+    StepKind{"wait", "SECONDS", "let this time pass", Stage::panel, parseWait},
+    StepKind{"expect", "\"ROW 0\" [\"ROW 1\"]",
+             "wait until the panel shows these rows, each filled up with blanks;\n"
+             "if ROW 1 is not given, the second row may be anything",
+             Stage::panel, parseExpect},
+    StepKind{"expect-cursor", "ROW COLUMN on|off",
+             "wait until the cursor is there, and blinks or does not", Stage::panel,
+             parseExpectCursor},
+    StepKind{"picture", "NAME", "print what the display shows, with v or ^ at a blinking cursor",
+             Stage::panel, parsePicture},
+    StepKind{"say", "TEXT", "print the rest of the line", Stage::panel, parseSay},
+    StepKind{"limit", "SECONDS", "let each step from here on wait so long for the panel",
+             Stage::panel, parseLimit},
+    StepKind{"run", "COMMAND",
+             "have /bin/sh run the rest of the line, which has to end with status 0\n"
+             "within 60 seconds; whatever it leaves running is ended",
+             Stage::panel, parseRun},
+    StepKind{"appliance", "VERB...",
+             "change something at the appliance that the program runs on, or check\n"
+             "something there, with one of the verbs below",
+             Stage::panel, parseAppliance},
+    StepKind{"scene", "TITLE",
+             "set up a fresh appliance, whose program starts at the next step that is\n"
+             "not about the appliance",
+             Stage::test, parseScene},
+    StepKind{"prints", "\"COMMAND\" \"OUTPUT\"",
+             "from here on let this command line of the program print this", Stage::test,
+             parsePrints},
+    StepKind{"answer", "HEX...",
+             "let the program read these bytes in place of the panel's next answer;\n"
+             "20*40 means the byte 20 forty times",
+             Stage::test, parseAnswer},
+    StepKind{"expect-sent", "[HEX...]",
+             "check that, apart from key requests, just these bytes have been sent\n"
+             "since the last step that pressed a key",
+             Stage::test, parseExpectSent},
+    StepKind{"expect-pause", "SECONDS \"ROW 0\" [\"ROW 1\"]",
+             "check how long the next pause was in which no key was read, and what\n"
+             "the panel showed in the meantime",
+             Stage::test, parseExpectPause},
+    StepKind{"expect-run", "\"COMMAND\" \"ROW 0\" [\"ROW 1\"]",
+             "check the command line of the configuration script's next run, and what\n"
+             "the panel showed in the meantime",
+             Stage::test, parseExpectRun},
+};
+
+std::string usage(const StepKind &kind) {
+    return std::string(kind.name) + (kind.arguments.empty() ? "" : " ") +
+           std::string(kind.arguments);
+}
+
+} // namespace
+
+Action parseStep(std::string_view line, Stage stage) {
+    const std::string_view name = line.substr(0, line.find_first_of(blanks));
+    const auto *kind = std::find_if(stepKinds.begin(), stepKinds.end(),
+                                    [&](const StepKind &each) { return each.name == name; });
+    if (kind == stepKinds.end())
+        reject("'" + std::string(name) + "' is not a step");
+    if (kind->stage == Stage::test && stage != Stage::test)
+        reject("'" + std::string(name) +
+               "' can be used only in the program's tests, in virtual time");
+    Arguments arguments(line.substr(name.size()));
+    std::string complaint;
+    try {
+        Action action = kind->parse(arguments);
+        if (arguments.isEmpty())
+            return action;
+    } catch (const std::invalid_argument &error) {
+        complaint = error.what();
+    }
+    reject(complaint.empty() ? "usage: " + usage(*kind) : complaint);
+}
+
+std::string stepsHelp(Stage stage) {
+    constexpr std::size_t indent = 21;
+    std::string text;
+    for (const StepKind &kind : stepKinds) {
+        if (kind.stage == stage)
+            text += helpEntry("  " + usage(kind), kind.help, indent);
+    }
+    return text + (stage == Stage::panel ? "The appliance's verbs are:\n" + verbsHelp() : "");
+}
+
+std::string quoted(std::string_view text) {
+    std::string word = "\"";
+    for (const char c : text) {
+        if (c == '"' || c == '\\')
+            word += '\\';
+        word += c == '\n' ? "\\n" : std::string(1, c);
+    }
+    return word + "\"";
+}
+
+} // namespace emulator

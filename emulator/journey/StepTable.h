@@ -1,0 +1,27 @@
+// The language of journeys, as a table: the row of a step determines its syntax, its
+// explanation, and its place in every list.
+#pragma once
+
+#include "emulator/journey/Steps.h"
+
+#include <string>
+#include <string_view>
+
+namespace emulator {
+
+/// Where a journey is to be played.
+enum class Stage {
+    panel, ///< on an emulated panel, beside a program that runs in real time
+    test,  ///< in a test, where the program's calls lead into a world of virtual time
+};
+
+/// Reads one step. Throws std::invalid_argument with what is wrong.
+Action parseStep(std::string_view line, Stage stage);
+
+/// What can be written in a journey: each step's usage and what it does, for `--help`.
+std::string stepsHelp(Stage stage);
+
+/// The word as it has to stand in a journey to be read as `text`: in quotes, with \", \\ and \n.
+std::string quoted(std::string_view text);
+
+} // namespace emulator

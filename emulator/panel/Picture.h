@@ -1,0 +1,31 @@
+#pragma once
+
+#include "emulator/panel/Display.h"
+
+#include <array>
+#include <string>
+
+namespace emulator {
+
+/// What an operator sees of the display at one moment. The same display gives the same bytes.
+class Picture {
+  public:
+    using Rows = std::array<std::string, Display::rowCount>;
+
+    explicit Picture(const Display &display);
+    /// A picture of two rows of text, without a cursor; rows are padded or cut to 16 columns.
+    explicit Picture(const Rows &itsRows);
+
+    /// A frame of four lines. A blinking cursor is marked at its column in the border next to its
+    /// row; bytes that are not printable ASCII show as question marks.
+    [[nodiscard]] std::string text() const;
+    /// An SVG file of the display's dots.
+    [[nodiscard]] std::string svg() const;
+
+  private:
+    Rows rows;
+    int cursorRow = -1; // -1 where no cursor is seen
+    int cursorColumn = -1;
+};
+
+} // namespace emulator
