@@ -1,5 +1,7 @@
 #include "emulator/Emulator.h"
 
+#include "emulator/panel/Picture.h"
+
 #include <algorithm>
 #include <csignal>
 #include <cstdlib>

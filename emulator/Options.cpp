@@ -157,7 +157,13 @@ a token that is made at each start; whoever has it can use the panel.
 
 A journey has one step on each line; # begins a comment. KEY is up, down, enter or
 escape. A word that contains blanks is written in double quotes; in the quotes, \",
-\\ and \n stand for ", \ and a line feed. The steps are:
+\\ and \n stand for ", \ and a line feed. SIGHT is what the panel has to show:
+  "ROW 0" ["ROW 1"] [at ROW COLUMN]
+                     these rows, each filled up with blanks, where * stands for any
+                     row 0; the second row may be anything if ROW 1 is not given. With
+                     at, the cursor blinks there
+  chosen "TEXT"      the marker > in front of this entry of a list, in either row
+The steps are:
 )" + stepsHelp(Stage::panel) +
            R"(The commands that a journey runs find PANEL_TTY and PANEL_COMMAND_PID, the number of
 the process that panel-emulator has started, in their environment.

@@ -1,8 +1,10 @@
 #include "Rack.h"
 
 #include "emulator/base/FileDescriptor.h"
+#include "emulator/panel/Picture.h"
 
 #include <boost/algorithm/string/erase.hpp>
+#include <boost/algorithm/string/trim.hpp>
 
 #include <csignal>
 #include <filesystem>
@@ -23,14 +25,16 @@ constexpr Micros commandTime = 5ms;
 constexpr Micros longestTurn = 3'700ms;
 constexpr std::size_t hiddenByAWipe = 24; // blanks past the visible columns
 
+// The titles of the editors are built alike.
 bool isEditor() {
-    const std::string row = world().display.visibleRow(0);
-    return boost::starts_with(row, "Enter ") || boost::starts_with(row, "DNS Server Addr:");
+    const std::string title = boost::trim_right_copy(world().display.visibleRow(0));
+    return boost::starts_with(title, "Enter ") || boost::ends_with(title, " Addr:");
 }
 
 bool isApplyScreen() {
-    return boost::starts_with(world().rows(), "ESC   - Cancel") ||
-           boost::starts_with(world().display.visibleRow(1), "> Apply Changes");
+    const Sight confirmation{"ESC   - Cancel  ", "ENTER - Apply   ", {}, {}};
+    const Sight lastItem{{}, {}, {}, "Apply Changes"};
+    return confirmation.isShownBy(world().display) || lastItem.isShownBy(world().display);
 }
 
 /// What one start of the program hands over to the next.
@@ -233,8 +237,9 @@ class Rack : public Surroundings {
         const std::string keyRequest("\xFE\0\xFE\x06", 4);
         const std::string sent = boost::erase_all_copy(world().sent, keyRequest);
         if (sent != expected.bytes)
-            isDone = [sent]() -> bool {
-                throw std::runtime_error("it was " + testing::PrintToString(sent));
+            isDone = [sent, expected]() -> bool {
+                throw std::runtime_error("wanted: " + testing::PrintToString(expected.bytes) +
+                                         "\nsent:   " + testing::PrintToString(sent) + "\n");
             };
     }
 
@@ -250,12 +255,14 @@ class Rack : public Surroundings {
     void awaitNext(const std::vector<World::Deed> &deeds, std::size_t &next,
                    const std::string &what, const Sight &sight) {
         const std::string blank(Display::visibleColumns, ' ');
-        isDone = [&deeds, &next, what, rows = sight.row0 + "|" + sight.row1.value_or(blank)] {
+        const std::string rows = sight.row0.value_or("") + "|" + sight.row1.value_or(blank);
+        isDone = [&deeds, &next, what, rows] {
             if (deeds.size() == next)
                 return false;
             const World::Deed &deed = deeds[next++];
             if (deed.what != what || deed.behind != rows)
-                throw std::runtime_error("it was " + deed.what + " behind " + deed.behind);
+                throw std::runtime_error("wanted: " + what + " behind " + rows + "\nit was: " +
+                                         deed.what + " behind " + deed.behind + "\n");
             return true;
         };
     }

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <stdexcept>
+#include <utility>
 
 namespace emulator {
 
@@ -20,7 +21,7 @@ std::string_view trimmed(std::string_view text) {
 }
 
 // No more is read than a line may have, so that a device that never ends does not fill the memory.
-bool readLine(std::istream &input, std::string &line) {
+bool getLine(std::istream &input, std::string &line) {
     line.resize(longestLine + 1);
     input.getline(line.data(), static_cast<std::streamsize>(line.size()));
     const auto count = static_cast<std::size_t>(input.gcount());
@@ -48,40 +49,107 @@ bool isScene(const Action &action) {
     return inTest != nullptr && std::holds_alternative<step::Scene>(*inTest);
 }
 
+bool beginsScene(const TextLine &line) {
+    return line.text.compare(0, 6, "scene ") == 0;
+}
+
+bool isSight(const TextLine &line) {
+    return line.text.front() == '"' || line.text.front() == '*';
+}
+
 } // namespace
 
-Journey::Journey(std::istream &input, std::string itsName, Stage stage) : name(std::move(itsName)) {
-    int line = 1;
-    try {
-        for (std::string text; readLine(input, text); line++) {
-            if (!isText(text))
-                throw std::invalid_argument("this is not text");
-            const std::string_view words = trimmed(text);
-            if (!words.empty() && words.front() != '#')
-                add({line, parseStep(words, stage)});
-        }
-    } catch (const std::invalid_argument &error) {
-        throw std::invalid_argument(place(line) + error.what());
+Journey::Journey(std::istream &input, std::string itsName, Stage itsStage)
+    : name(std::move(itsName)), stage(itsStage) {
+    std::vector<TextLine> scene; // nothing outside one
+    TextLine line{0, ""};
+    while (takeLine(input, line)) {
+        if (line.text.empty() || line.text.front() == '#')
+            continue;
+        if (stage == Stage::test && beginsScene(line))
+            readScene(std::exchange(scene, {line}));
+        else if (!scene.empty())
+            scene.push_back(line);
+        else
+            readLine(line);
     }
+    readScene(scene);
     if (input.bad())
         throw std::invalid_argument(name + ": cannot be read");
+    endListing();
     if (allSteps.empty())
         throw std::invalid_argument(name + ": there is no step in it");
 }
 
-void Journey::add(Step step) {
+bool Journey::takeLine(std::istream &input, TextLine &line) try {
+    line.number++;
+    std::string text;
+    const bool isThere = getLine(input, text);
+    if (!isText(text))
+        throw std::invalid_argument("this is not text");
+    line.text = trimmed(text);
+    return isThere;
+} catch (const std::invalid_argument &error) {
+    throw std::invalid_argument(place(line.number) + error.what());
+}
+
+void Journey::readScene(const std::vector<TextLine> &scene) {
+    for (const TextLine &line : expandTable(scene))
+        readLine(line);
+}
+
+void Journey::readLine(const TextLine &line) {
+    if (!isSight(line))
+        endListing();
+    try {
+        isSight(line) ? readSight(line) : readStep(line);
+    } catch (const std::invalid_argument &error) {
+        throw std::invalid_argument(place(line.number) + error.what());
+    }
+}
+
+void Journey::endListing() {
+    if (listing && listing->isEmpty)
+        throw std::invalid_argument(place(listing->line) + "no sights stand behind this step");
+    listing.reset();
+}
+
+void Journey::readSight(const TextLine &line) {
+    if (!listing)
+        throw std::invalid_argument("a sight stands behind a walk or a hold");
+    listing->isEmpty = false;
+    add(line, listing->beforeEach);
+    add(line, std::get<Action>(parseStep("expect " + line.text, stage)));
+}
+
+void Journey::readStep(const TextLine &line) {
+    const ParsedStep parsed = parseStep(line.text, stage);
+    if (const auto *action = std::get_if<Action>(&parsed))
+        return add(line, *action);
+    const auto &walk = std::get<step::Walk>(parsed);
+    const Action beforeEach = walk.isHold ? Action(step::Hold{walk.key, 1})
+                                          : Action(step::Tap{walk.key, 1, std::nullopt});
+    if (walk.letters.empty())
+        listing = Listing{line.number, beforeEach, true};
+    for (const char letter : walk.letters) {
+        add(line, beforeEach);
+        add(line, step::ExpectLetter{letter});
+    }
+}
+
+void Journey::add(const TextLine &line, const Action &action) {
     if (allSteps.size() == mostSteps)
         throw std::invalid_argument("there are too many steps");
     // The one poll of a tap could not be told from those of the hold.
-    if (isScene(step.action))
+    if (isScene(action))
         isKeyDown = false;
-    if (isKeyDown && isAboutTheKeypad(step.action))
+    if (isKeyDown && isAboutTheKeypad(action))
         throw std::invalid_argument("a key is still held: release it first");
-    if (std::holds_alternative<step::Hold>(step.action))
+    if (std::holds_alternative<step::Hold>(action))
         isKeyDown = true;
-    if (std::holds_alternative<step::Release>(step.action))
+    if (std::holds_alternative<step::Release>(action))
         isKeyDown = false;
-    allSteps.push_back(std::move(step));
+    allSteps.push_back({line.number, line.text, action});
 }
 
 std::string Journey::place(int line) const {

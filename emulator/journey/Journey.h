@@ -1,14 +1,17 @@
 #pragma once
 
 #include "emulator/journey/StepTable.h"
+#include "emulator/journey/expandTable.h"
 
 #include <istream>
+#include <optional>
 #include <string>
 #include <vector>
 
 namespace emulator {
 
-/// An operator's journey, read from a text with one step a line (see StepTable).
+/// An operator's journey, read from a text with one step a line (see StepTable). The steps that
+/// follow from a walk, or from the table of a scene, are among its steps like any others.
 class Journey {
   public:
     /// Reads a whole journey that is to be played on `stage`. Throws std::invalid_argument with
@@ -20,12 +23,27 @@ class Journey {
     [[nodiscard]] std::string place(const Step &step) const { return place(step.line); }
 
   private:
+    /// A walk or a hold, behind which its sights stand.
+    struct Listing {
+        int line;
+        Action beforeEach;
+        bool isEmpty;
+    };
+
     [[nodiscard]] std::string place(int line) const;
-    void add(Step step);
+    bool takeLine(std::istream &input, TextLine &line);
+    void readScene(const std::vector<TextLine> &scene);
+    void readLine(const TextLine &line);
+    void readSight(const TextLine &line);
+    void readStep(const TextLine &line);
+    void endListing();
+    void add(const TextLine &line, const Action &action);
 
     std::string name;
+    Stage stage;
     std::vector<Step> allSteps;
     bool isKeyDown = false; // at the end of the steps so far
+    std::optional<Listing> listing;
 };
 
 } // namespace emulator

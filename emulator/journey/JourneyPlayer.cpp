@@ -1,5 +1,7 @@
 #include "emulator/journey/JourneyPlayer.h"
 
+#include "emulator/panel/Picture.h"
+
 #include <fstream>
 #include <stdexcept>
 #include <utility>
@@ -14,13 +16,25 @@ constexpr std::chrono::seconds runLimit{60};
     throw std::runtime_error(reason);
 }
 
+constexpr std::size_t rememberedSights = 3;
+
 std::string described(const step::ExpectCursor &cursor) {
-    return "row " + std::to_string(cursor.row) + ", column " + std::to_string(cursor.column) +
-           (cursor.blinking ? ", on" : ", off");
+    return "row " + std::to_string(cursor.place.row) + ", column " +
+           std::to_string(cursor.place.column) + (cursor.blinking ? ", on" : ", off");
 }
 
 step::ExpectCursor cursorOf(const Display &display) {
-    return {display.cursorRow(), display.cursorColumn(), display.cursorBlinking()};
+    return {{display.cursorRow(), display.cursorColumn()}, display.cursorBlinking()};
+}
+
+bool isSame(const step::ExpectCursor &one, const step::ExpectCursor &other) {
+    return one.place.row == other.place.row && one.place.column == other.place.column &&
+           one.blinking == other.blinking;
+}
+
+char letterAtCursor(const Display &display) {
+    return display.wholeRow(display.cursorRow())
+        .at(static_cast<std::size_t>(display.cursorColumn()));
 }
 
 } // namespace
@@ -35,6 +49,7 @@ bool JourneyPlayer::advance(TimePoint time) {
     now = time;
     while (next < journey.steps().size()) {
         const Step &step = journey.steps()[next];
+        rememberSight();
         try {
             if (!hasBegun) {
                 deadline = now + limit;
@@ -49,12 +64,31 @@ bool JourneyPlayer::advance(TimePoint time) {
                 return false;
             }
         } catch (const std::runtime_error &error) {
-            throw std::runtime_error(journey.place(step) + error.what());
+            throw std::runtime_error(journey.place(step) + step.text + "\n" + error.what() +
+                                     sightsBefore());
         }
         hasBegun = false;
         next++;
     }
     return true;
+}
+
+// What the program has drawn before it asks for a key is what an operator sees.
+void JourneyPlayer::rememberSight() {
+    if (std::exchange(requestsSeen, panel.keypad.requests()) == panel.keypad.requests())
+        return;
+    const std::string sight = Picture(panel.display).text();
+    if (sights.empty() || sights.back() != sight)
+        sights.push_back(sight);
+    if (sights.size() > rememberedSights)
+        sights.pop_front();
+}
+
+std::string JourneyPlayer::sightsBefore() const {
+    std::string text = "the last that the panel showed when it was asked for keys:\n";
+    for (const std::string &sight : sights)
+        text += sight;
+    return sights.empty() ? "" : text;
 }
 
 void JourneyPlayer::goTo(std::size_t step) {
@@ -71,7 +105,7 @@ bool JourneyPlayer::play(const step::Tap &tap, bool begins) {
         tapsLeft = tap.count;
     else if (!panel.keypad.settled())
         return false;
-    if (tap.until && shows(*tap.until))
+    if (tap.until && tap.until->isShownBy(panel.display))
         return true;
     if (tapsLeft == 0 && tap.until)
         fail("after " + std::to_string(tap.count) +
@@ -126,13 +160,15 @@ bool JourneyPlayer::play(const step::Wait &wait, bool begins) {
 }
 
 bool JourneyPlayer::play(const step::Expect &expect, bool) {
-    return shows(expect.sight);
+    return expect.sight.isShownBy(panel.display);
 }
 
 bool JourneyPlayer::play(const step::ExpectCursor &cursor, bool) {
-    const step::ExpectCursor actual = cursorOf(panel.display);
-    return actual.row == cursor.row && actual.column == cursor.column &&
-           actual.blinking == cursor.blinking;
+    return isSame(cursorOf(panel.display), cursor);
+}
+
+bool JourneyPlayer::play(const step::ExpectLetter &expected, bool) {
+    return letterAtCursor(panel.display) == expected.letter;
 }
 
 bool JourneyPlayer::play(const step::TakePicture &picture, bool) {
@@ -187,9 +223,12 @@ bool JourneyPlayer::play(const TestAction &action, bool begins) {
 }
 
 std::string JourneyPlayer::delay(const step::Expect &expect) const {
-    const Sight &sight = expect.sight;
-    return "the panel does not show what is expected\nwanted:\n" +
-           Picture({sight.row0, sight.row1.value_or("(any)")}).text() + shown();
+    return "the panel does not show what is expected\nwanted:\n" + expect.sight.text() + shown();
+}
+
+std::string JourneyPlayer::delay(const step::ExpectLetter &expected) const {
+    return std::string("the cursor is not on the letter\nwanted: ") + expected.letter +
+           "\nis on:  " + letterAtCursor(panel.display) + "\n" + shown();
 }
 
 std::string JourneyPlayer::delay(const step::ExpectCursor &cursor) const {
@@ -227,12 +266,6 @@ bool JourneyPlayer::hasSucceeded() {
     if (status && *status != 0)
         fail("it ended with status " + std::to_string(*status));
     return status.has_value();
-}
-
-bool JourneyPlayer::shows(const Sight &sight) const {
-    const Display &display = panel.display;
-    return display.visibleRow(0) == sight.row0 &&
-           (!sight.row1 || display.visibleRow(1) == *sight.row1);
 }
 
 std::string JourneyPlayer::shown() const {

@@ -6,6 +6,7 @@
 #include "emulator/panel/Display.h"
 #include "emulator/panel/Keypad.h"
 
+#include <deque>
 #include <filesystem>
 #include <optional>
 #include <ostream>
@@ -49,6 +50,7 @@ class JourneyPlayer {
     bool play(const step::Wait &wait, bool begins);
     bool play(const step::Expect &expect, bool begins);
     bool play(const step::ExpectCursor &cursor, bool begins);
+    bool play(const step::ExpectLetter &expected, bool begins);
     bool play(const step::TakePicture &picture, bool begins);
     bool play(const step::Say &say, bool begins);
     bool play(const step::Limit &newLimit, bool begins);
@@ -59,6 +61,7 @@ class JourneyPlayer {
     // Why a step has not come to its end in time.
     [[nodiscard]] std::string delay(const step::Expect &expect) const;
     [[nodiscard]] std::string delay(const step::ExpectCursor &cursor) const;
+    [[nodiscard]] std::string delay(const step::ExpectLetter &expected) const;
     [[nodiscard]] std::string delay(const step::Run &run) const;
     [[nodiscard]] std::string delay(const step::Appliance &appliance) const;
     [[nodiscard]] std::string delay(const TestAction &action) const;
@@ -69,8 +72,9 @@ class JourneyPlayer {
     void awaitAnswers();
     bool isAnswered(int polls);
     bool hasSucceeded();
-    [[nodiscard]] bool shows(const Sight &sight) const;
     [[nodiscard]] std::string shown() const;
+    void rememberSight();
+    [[nodiscard]] std::string sightsBefore() const;
     [[nodiscard]] std::string unansweredKey() const;
 
     Journey journey;
@@ -89,6 +93,8 @@ class JourneyPlayer {
     unsigned long answersBefore = 0;  // answers to key requests, when the key went down
     unsigned long answersLast = 0;    // and when they were last looked at
     unsigned long requestsBefore = 0; // key requests when the step began
+    unsigned long requestsSeen = 0;   // and when the panel was last looked at
+    std::deque<std::string> sights;   // the last different ones
 };
 
 } // namespace emulator

@@ -14,19 +14,19 @@ std::string withoutBlanksAtEnd(std::string text) {
     return text;
 }
 
-// The steps that expect what the display shows. There are none if a journey cannot express it, such
+// The step that expects what the display shows. There is none if a journey cannot express it, such
 // as a character outside ASCII.
-std::string stepsThatExpect(const Display &display) {
+std::string stepThatExpects(const Display &display) {
     const std::string row0 = display.visibleRow(0), row1 = display.visibleRow(1);
     if (!std::all_of(row0.begin(), row0.end(), isPrintable) ||
         !std::all_of(row1.begin(), row1.end(), isPrintable))
         return "";
-    std::string steps = "expect " + quoted(withoutBlanksAtEnd(row0)) + " " +
-                        quoted(withoutBlanksAtEnd(row1)) + "\n";
+    std::string step =
+        "expect " + quoted(withoutBlanksAtEnd(row0)) + " " + quoted(withoutBlanksAtEnd(row1));
     if (display.cursorBlinking())
-        steps += "expect-cursor " + std::to_string(display.cursorRow()) + " " +
-                 std::to_string(display.cursorColumn()) + " on\n";
-    return steps;
+        step += " at " + std::to_string(display.cursorRow()) + " " +
+                std::to_string(display.cursorColumn());
+    return step + "\n";
 }
 
 } // namespace
@@ -44,7 +44,7 @@ std::optional<int> Recorder::look(TimePoint) {
     const bool isAsked = keypad.requests() != requestsSeen;
     requestsSeen = keypad.requests();
     if (isAsked || keypad.answered() != answersSeen)
-        sight = stepsThatExpect(display);
+        sight = stepThatExpects(display);
     countAnswers();
     if (held && keypad.settled())
         writeStroke(true);

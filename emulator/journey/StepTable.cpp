@@ -112,10 +112,27 @@ class Arguments {
         row.resize(Display::visibleColumns, ' ');
         return row;
     }
+    Sight::Cursor takePlace() {
+        const int row = takeInteger(0, Display::rowCount - 1, "a row");
+        return {row, takeInteger(0, Display::columns - 1, "a column")};
+    }
     Sight takeSight() {
-        Sight sight{takeRow(), std::nullopt};
-        if (!isEmpty())
+        Sight sight;
+        if (nextIs("chosen")) {
+            take();
+            sight.chosen = take();
+            return sight;
+        }
+        if (nextIs("*"))
+            take();
+        else
+            sight.row0 = takeRow();
+        if (!isEmpty() && !nextIs("at"))
             sight.row1 = takeRow();
+        if (!isEmpty()) {
+            take("at");
+            sight.cursor = takePlace();
+        }
         return sight;
     }
 
@@ -140,7 +157,7 @@ class Arguments {
     std::string_view rest;
 };
 
-Action parseTap(Arguments &words) {
+ParsedStep parseTap(Arguments &words) {
     step::Tap tap{words.takeKey(), 1, std::nullopt};
     const bool isCounted = words.nextIsNumber();
     if (isCounted)
@@ -162,7 +179,7 @@ Key keyOfLetter(char letter) {
     reject(std::string("'") + letter + "' is not the letter of a key: u, d, e or x");
 }
 
-Action parseKeys(Arguments &words) {
+ParsedStep parseKeys(Arguments &words) {
     constexpr std::string_view digits = "0123456789";
     step::Keys sequence;
     do {
@@ -180,27 +197,36 @@ Action parseKeys(Arguments &words) {
     return sequence;
 }
 
-Action parseHold(Arguments &words) {
+ParsedStep parseHold(Arguments &words) {
     const Key key = words.takeKey();
+    if (words.isEmpty())
+        return step::Walk{key, true, ""};
     return step::Hold{key, words.takePolls()};
 }
 
-Action parseRelease(Arguments &) {
+ParsedStep parseWalk(Arguments &words) {
+    const Key key = words.takeKey();
+    return step::Walk{key, false, words.isEmpty() ? "" : words.take()};
+}
+
+ParsedStep parseWith(Arguments &) {
+    reject("a table stands in a scene");
+}
+
+ParsedStep parseRelease(Arguments &) {
     return step::Release{};
 }
 
-Action parseWait(Arguments &words) {
+ParsedStep parseWait(Arguments &words) {
     return step::Wait{words.takeSeconds()};
 }
 
-Action parseExpect(Arguments &words) {
+ParsedStep parseExpect(Arguments &words) {
     return step::Expect{words.takeSight()};
 }
 
-Action parseExpectCursor(Arguments &words) {
-    step::ExpectCursor cursor{};
-    cursor.row = words.takeInteger(0, Display::rowCount - 1, "a row");
-    cursor.column = words.takeInteger(0, Display::columns - 1, "a column");
+ParsedStep parseExpectCursor(Arguments &words) {
+    step::ExpectCursor cursor{words.takePlace(), false};
     const std::string state = words.take();
     if (state != "on" && state != "off")
         reject("'" + state + "' is not on or off");
@@ -208,7 +234,7 @@ Action parseExpectCursor(Arguments &words) {
     return cursor;
 }
 
-Action parsePicture(Arguments &words) {
+ParsedStep parsePicture(Arguments &words) {
     const std::string name = words.take();
     const bool isPlain =
         name.find_first_not_of("abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ"
@@ -218,22 +244,22 @@ Action parsePicture(Arguments &words) {
     return step::TakePicture{name};
 }
 
-Action parseSay(Arguments &words) {
+ParsedStep parseSay(Arguments &words) {
     return step::Say{words.takeRest()};
 }
 
-Action parseLimit(Arguments &words) {
+ParsedStep parseLimit(Arguments &words) {
     return step::Limit{words.takeSeconds()};
 }
 
-Action parseRun(Arguments &words) {
+ParsedStep parseRun(Arguments &words) {
     step::Run run{words.takeRest()};
     if (run.command.empty())
         reject("");
     return run;
 }
 
-Action parseAppliance(Arguments &words) {
+ParsedStep parseAppliance(Arguments &words) {
     step::Appliance appliance;
     do {
         appliance.words.push_back(words.take());
@@ -242,31 +268,31 @@ Action parseAppliance(Arguments &words) {
     return appliance;
 }
 
-Action parseScene(Arguments &words) {
+ParsedStep parseScene(Arguments &words) {
     return TestAction(step::Scene{words.takeRest()});
 }
 
-Action parsePrints(Arguments &words) {
+ParsedStep parsePrints(Arguments &words) {
     step::Prints prints{words.take(), ""};
     prints.output = words.take();
     return TestAction(prints);
 }
 
-Action parseAnswer(Arguments &words) {
+ParsedStep parseAnswer(Arguments &words) {
     return TestAction(step::Answer{words.takeBytes()});
 }
 
-Action parseExpectSent(Arguments &words) {
+ParsedStep parseExpectSent(Arguments &words) {
     return TestAction(step::ExpectSent{words.takeBytes()});
 }
 
-Action parseExpectPause(Arguments &words) {
+ParsedStep parseExpectPause(Arguments &words) {
     step::ExpectPause pause{words.takeSeconds(), {}};
     pause.sight = words.takeSight();
     return TestAction(pause);
 }
 
-Action parseExpectRun(Arguments &words) {
+ParsedStep parseExpectRun(Arguments &words) {
     step::ExpectRun run{words.take(), {}};
     run.sight = words.takeSight();
     return TestAction(run);
@@ -277,33 +303,36 @@ struct StepKind {
     std::string_view arguments;
     std::string_view help; // lines, separated by line feeds
     Stage stage;           // where it can be played: Stage::panel means everywhere
-    Action (*parse)(Arguments &);
+    ParsedStep (*parse)(Arguments &);
 };
 
 constexpr std::array stepKinds{
-    StepKind{"tap", "KEY [N] [until \"ROW 0\" [\"ROW 1\"]]",
+    StepKind{"tap", "KEY [N] [until SIGHT]",
              "press KEY for exactly one key request, and wait until a whole poll\n"
              "has gone by without it; do this N times. With until, stop as soon\n"
-             "as the panel shows these rows, and fail after N taps (default: 100)",
+             "as the panel shows SIGHT, and fail after N taps (default: 100)",
              Stage::panel, parseTap},
     StepKind{"keys", "LETTERS...",
              "tap many keys: u, d, e and x stand for up, down, enter and escape.\n"
              "With a number behind its letter, a key is held for that many key\n"
              "requests",
              Stage::panel, parseKeys},
-    StepKind{"hold", "KEY POLLS",
+    StepKind{"walk", "KEY [\"LETTERS\"]",
+             "tap KEY once for each of the letters, and expect that letter at the\n"
+             "cursor. Without letters: tap KEY once for each of the next lines that\n"
+             "begin with a quote or *, and expect the SIGHT that stands there",
+             Stage::panel, parseWalk},
+    StepKind{"hold", "KEY [POLLS]",
              "press KEY and wait until it has answered that many key requests;\n"
-             "the key stays down, and another hold goes on counting",
+             "the key stays down, and another hold goes on counting. Without POLLS:\n"
+             "hold KEY for one poll more before each SIGHT in the next lines",
              Stage::panel, parseHold},
     StepKind{"release", "",
              "let the key come up, and wait until a whole poll has gone by without\n"
              "it",
              Stage::panel, parseRelease},
     StepKind{"wait", "SECONDS", "let this time pass", Stage::panel, parseWait},
-    StepKind{"expect", "\"ROW 0\" [\"ROW 1\"]",
-             "wait until the panel shows these rows, each filled up with blanks;\n"
-             "if ROW 1 is not given, the second row may be anything",
-             Stage::panel, parseExpect},
+    StepKind{"expect", "SIGHT", "wait until the panel shows SIGHT", Stage::panel, parseExpect},
     StepKind{"expect-cursor", "ROW COLUMN on|off",
              "wait until the cursor is there, and blinks or does not", Stage::panel,
              parseExpectCursor},
@@ -324,6 +353,10 @@ constexpr std::array stepKinds{
              "set up a fresh appliance, whose program starts at the next step that is\n"
              "not about the appliance",
              Stage::test, parseScene},
+    StepKind{"with", "WORD...",
+             "stands in a scene, and gives it a table: the scene is played once for\n"
+             "each such line, and $1 to $9 in its other lines stand for these words",
+             Stage::test, parseWith},
     StepKind{"prints", "\"COMMAND\" \"OUTPUT\"",
              "from here on let this command line of the program print this", Stage::test,
              parsePrints},
@@ -335,11 +368,11 @@ constexpr std::array stepKinds{
              "check that, apart from key requests, just these bytes have been sent\n"
              "since the last step that pressed a key",
              Stage::test, parseExpectSent},
-    StepKind{"expect-pause", "SECONDS \"ROW 0\" [\"ROW 1\"]",
+    StepKind{"expect-pause", "SECONDS SIGHT",
              "check how long the next pause was in which no key was read, and what\n"
              "the panel showed in the meantime",
              Stage::test, parseExpectPause},
-    StepKind{"expect-run", "\"COMMAND\" \"ROW 0\" [\"ROW 1\"]",
+    StepKind{"expect-run", "\"COMMAND\" SIGHT",
              "check the command line of the configuration script's next run, and what\n"
              "the panel showed in the meantime",
              Stage::test, parseExpectRun},
@@ -352,7 +385,7 @@ std::string usage(const StepKind &kind) {
 
 } // namespace
 
-Action parseStep(std::string_view line, Stage stage) {
+ParsedStep parseStep(std::string_view line, Stage stage) {
     const std::string_view name = line.substr(0, line.find_first_of(blanks));
     const auto *kind = std::find_if(stepKinds.begin(), stepKinds.end(),
                                     [&](const StepKind &each) { return each.name == name; });
@@ -364,9 +397,9 @@ Action parseStep(std::string_view line, Stage stage) {
     Arguments arguments(line.substr(name.size()));
     std::string complaint;
     try {
-        Action action = kind->parse(arguments);
+        ParsedStep step = kind->parse(arguments);
         if (arguments.isEmpty())
-            return action;
+            return step;
     } catch (const std::invalid_argument &error) {
         complaint = error.what();
     }

@@ -15,8 +15,11 @@ enum class Stage {
     test,  ///< in a test, where the program's calls lead into a world of virtual time
 };
 
-/// Reads one step. Throws std::invalid_argument with what is wrong.
-Action parseStep(std::string_view line, Stage stage);
+using ParsedStep = std::variant<Action, step::Walk>;
+
+/// Reads one step, or a walk, whose steps follow from it and from the sights behind it. Throws
+/// std::invalid_argument with what is wrong.
+ParsedStep parseStep(std::string_view line, Stage stage);
 
 /// What can be written in a journey: each step's usage and what it does, for `--help`.
 std::string stepsHelp(Stage stage);

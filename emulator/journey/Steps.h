@@ -3,8 +3,8 @@
 #pragma once
 
 #include "emulator/base/Clock.h"
+#include "emulator/journey/Sight.h"
 #include "emulator/panel/Key.h"
-#include "emulator/panel/Picture.h"
 
 #include <optional>
 #include <string>
@@ -12,12 +12,6 @@
 #include <vector>
 
 namespace emulator {
-
-/// Two rows that are to be seen, each filled up with blanks to 16 characters.
-struct Sight {
-    std::string row0;
-    std::optional<std::string> row1; ///< any, where it is not given
-};
 
 /// A key that is pressed until it has answered `polls` key requests, and then let go.
 struct Stroke {
@@ -56,9 +50,21 @@ struct Expect {
 };
 
 struct ExpectCursor {
-    int row;
-    int column;
+    Sight::Cursor place;
     bool blinking;
+};
+
+/// The character that the cursor is on.
+struct ExpectLetter {
+    char letter;
+};
+
+/// Before each sight that is listed behind this step, KEY is tapped or, in a hold, held for one
+/// poll more. Of a walk through letters, each is tapped for and expected at the cursor.
+struct Walk {
+    Key key;
+    bool isHold;
+    std::string letters;
 };
 
 struct TakePicture {
@@ -124,11 +130,12 @@ using TestAction = std::variant<step::Scene, step::Prints, step::Answer, step::E
                                 step::ExpectPause, step::ExpectRun>;
 
 using Action = std::variant<step::Tap, step::Keys, step::Hold, step::Release, step::Wait,
-                            step::Expect, step::ExpectCursor, step::TakePicture, step::Say,
-                            step::Limit, step::Run, step::Appliance, TestAction>;
+                            step::Expect, step::ExpectCursor, step::ExpectLetter, step::TakePicture,
+                            step::Say, step::Limit, step::Run, step::Appliance, TestAction>;
 
 struct Step {
-    int line; ///< of the journey's text, from 1
+    int line;         ///< of the journey's text, from 1
+    std::string text; ///< of that line, with the values of the scene's table in it
     Action action;
 };
 

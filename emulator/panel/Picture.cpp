@@ -78,7 +78,8 @@ Picture::Picture(const Display &display) {
     }
 }
 
-Picture::Picture(const Rows &itsRows) : rows(itsRows) {
+Picture::Picture(const Rows &itsRows, int itsCursorRow, int itsCursorColumn)
+    : rows(itsRows), cursorRow(itsCursorRow), cursorColumn(itsCursorColumn) {
     for (std::string &row : rows)
         row.resize(Display::visibleColumns, ' ');
 }

@@ -1,6 +1,7 @@
 #include "emulator/journey/JourneyPlayer.h"
 #include "emulator/line/Line.h"
 #include "emulator/panel/Font.h"
+#include "emulator/panel/Picture.h"
 
 #include <gtest/gtest.h>
 
@@ -118,6 +119,8 @@ TEST(Journey, RefusesWrongStepsWithTheirLine) {
         EXPECT_EQ(message.find('\x1B'), std::string::npos);
     }
     EXPECT_EQ(refusal([] { parse(" \n# nothing\n"); }), "trip: there is no step in it");
+    EXPECT_EQ(refusal([] { parse("walk up\n\nrelease\n"); }),
+              "trip:1: no sights stand behind this step");
     parse("say " + std::string(4092, '.'));
     EXPECT_EQ(refusal([] { parse("say a\nsay " + std::string(4093, '.')); }),
               "trip:2: the line is too long");
