@@ -19,7 +19,7 @@ try() {
 installed() {
     read_only --bind "$work" "$work" -- \
         cmake --build "$folder" --target install -j"$(nproc)" >"$work/log" 2>&1 || cat "$work/log"
-    (cd "$folder/prefix" && find bin sbin -type f 2>/dev/null | sort | xargs)
+    (cd "$folder/prefix" && find bin sbin ! -type d 2>/dev/null | sort | xargs)
 }
 source=$1
 without_tests=-DCMAKE_DISABLE_FIND_PACKAGE_GTest=ON # as if GoogleTest were not installed
