@@ -1,4 +1,4 @@
-// Reads numbers that people write in options and in journeys.
+// Numbers as people write them in options and in journeys.
 #pragma once
 
 #include <charconv>
@@ -32,6 +32,12 @@ inline unsigned char parseByte(const std::string &word) {
     if (error != std::errc() || stop != end || word.size() != 2)
         throw std::invalid_argument("'" + word + "' is not a byte of two hexadecimal digits");
     return value;
+}
+
+/// The byte as two hexadecimal digits.
+inline std::string hexadecimal(unsigned char byte) {
+    constexpr const char *digits = "0123456789ABCDEF";
+    return {digits[byte >> 4U], digits[byte & 0xFU]};
 }
 
 } // namespace emulator

@@ -2,7 +2,6 @@
 
 #include "emulator/panel/Picture.h"
 
-#include <fstream>
 #include <stdexcept>
 #include <utility>
 
@@ -59,8 +58,8 @@ bool JourneyPlayer::advance(TimePoint time) {
             if (!std::visit([&](const auto &action) { return play(action, begins); },
                             step.action)) {
                 if (now >= deadline)
-                    fail(
-                        std::visit([&](const auto &action) { return delay(action); }, step.action));
+                    fail(std::visit([&](const auto &action) { return complaint(action); },
+                                    step.action));
                 return false;
             }
         } catch (const std::runtime_error &error) {
@@ -110,7 +109,7 @@ bool JourneyPlayer::play(const step::Tap &tap, bool begins) {
     if (tapsLeft == 0 && tap.until)
         fail("after " + std::to_string(tap.count) +
              " taps the panel still does not show what is expected\n" +
-             delay(step::Expect{*tap.until}));
+             complaint(step::Expect{*tap.until}));
     if (tapsLeft == 0)
         return true;
     tapsLeft--;
@@ -174,14 +173,8 @@ bool JourneyPlayer::play(const step::ExpectLetter &expected, bool) {
 bool JourneyPlayer::play(const step::TakePicture &picture, bool) {
     const Picture taken(panel.display);
     output << taken.text() << std::flush;
-    if (!pictures)
-        return true;
-    const std::filesystem::path path = *pictures / (picture.name + ".svg");
-    std::ofstream file(path, std::ios::binary);
-    file << taken.svg();
-    file.close();
-    if (!file)
-        fail("cannot write " + path.string());
+    if (pictures)
+        taken.write(*pictures / (picture.name + ".svg"));
     return true;
 }
 
@@ -222,29 +215,29 @@ bool JourneyPlayer::play(const TestAction &action, bool begins) {
     return hasSucceeded();
 }
 
-std::string JourneyPlayer::delay(const step::Expect &expect) const {
+std::string JourneyPlayer::complaint(const step::Expect &expect) const {
     return "the panel does not show what is expected\nwanted:\n" + expect.sight.text() + shown();
 }
 
-std::string JourneyPlayer::delay(const step::ExpectLetter &expected) const {
+std::string JourneyPlayer::complaint(const step::ExpectLetter &expected) const {
     return std::string("the cursor is not on the letter\nwanted: ") + expected.letter +
            "\nis on:  " + letterAtCursor(panel.display) + "\n" + shown();
 }
 
-std::string JourneyPlayer::delay(const step::ExpectCursor &cursor) const {
+std::string JourneyPlayer::complaint(const step::ExpectCursor &cursor) const {
     return "the cursor is not where it is expected\nwanted: " + described(cursor) +
            "\nis at:  " + described(cursorOf(panel.display)) + "\n" + shown();
 }
 
-std::string JourneyPlayer::delay(const step::Run &) const {
+std::string JourneyPlayer::complaint(const step::Run &) const {
     return "the command is still running after 60 s";
 }
 
-std::string JourneyPlayer::delay(const step::Appliance &) const {
+std::string JourneyPlayer::complaint(const step::Appliance &) const {
     return "the appliance is still busy with it after 60 s";
 }
 
-std::string JourneyPlayer::delay(const TestAction &) const {
+std::string JourneyPlayer::complaint(const TestAction &) const {
     return "this has not happened\n" + shown();
 }
 

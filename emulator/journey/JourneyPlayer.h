@@ -59,13 +59,13 @@ class JourneyPlayer {
     bool play(const TestAction &action, bool begins);
 
     // Why a step has not come to its end in time.
-    [[nodiscard]] std::string delay(const step::Expect &expect) const;
-    [[nodiscard]] std::string delay(const step::ExpectCursor &cursor) const;
-    [[nodiscard]] std::string delay(const step::ExpectLetter &expected) const;
-    [[nodiscard]] std::string delay(const step::Run &run) const;
-    [[nodiscard]] std::string delay(const step::Appliance &appliance) const;
-    [[nodiscard]] std::string delay(const TestAction &action) const;
-    template <typename AnyOther> [[nodiscard]] std::string delay(const AnyOther &) const {
+    [[nodiscard]] std::string complaint(const step::Expect &expect) const;
+    [[nodiscard]] std::string complaint(const step::ExpectCursor &cursor) const;
+    [[nodiscard]] std::string complaint(const step::ExpectLetter &expected) const;
+    [[nodiscard]] std::string complaint(const step::Run &run) const;
+    [[nodiscard]] std::string complaint(const step::Appliance &appliance) const;
+    [[nodiscard]] std::string complaint(const TestAction &action) const;
+    template <typename AnyOther> [[nodiscard]] std::string complaint(const AnyOther &) const {
         return unansweredKey();
     }
 

@@ -13,7 +13,7 @@ bool isChosen(const std::string &row, const std::string &entry) {
     return row.front() == '>' && begin < end && row.substr(begin, end - begin) == entry;
 }
 
-bool blinksAt(const Display &display, const Sight::Cursor &cursor) {
+bool blinksAt(const Display &display, const Display::Place &cursor) {
     return display.cursorBlinking() && display.cursorRow() == cursor.row &&
            display.cursorColumn() == cursor.column;
 }
@@ -30,9 +30,7 @@ bool Sight::isShownBy(const Display &display) const {
 std::string Sight::text() const {
     if (chosen)
         return "> " + *chosen + "\n";
-    return Picture({row0.value_or("(any)"), row1.value_or("(any)")}, cursor ? cursor->row : -1,
-                   cursor ? cursor->column : -1)
-        .text();
+    return Picture({row0.value_or("(any)"), row1.value_or("(any)")}, cursor).text();
 }
 
 } // namespace emulator

@@ -112,7 +112,7 @@ class Arguments {
         row.resize(Display::visibleColumns, ' ');
         return row;
     }
-    Sight::Cursor takePlace() {
+    Display::Place takePlace() {
         const int row = takeInteger(0, Display::rowCount - 1, "a row");
         return {row, takeInteger(0, Display::columns - 1, "a column")};
     }
@@ -302,7 +302,7 @@ struct StepKind {
     std::string_view name;
     std::string_view arguments;
     std::string_view help; // lines, separated by line feeds
-    Stage stage;           // where it can be played: Stage::panel means everywhere
+    bool needsTest;        // it can be played in a test only
     ParsedStep (*parse)(Arguments &);
 };
 
@@ -311,71 +311,69 @@ constexpr std::array stepKinds{
              "press KEY for exactly one key request, and wait until a whole poll\n"
              "has gone by without it; do this N times. With until, stop as soon\n"
              "as the panel shows SIGHT, and fail after N taps (default: 100)",
-             Stage::panel, parseTap},
+             false, parseTap},
     StepKind{"keys", "LETTERS...",
              "tap many keys: u, d, e and x stand for up, down, enter and escape.\n"
              "With a number behind its letter, a key is held for that many key\n"
              "requests",
-             Stage::panel, parseKeys},
+             false, parseKeys},
     StepKind{"walk", "KEY [\"LETTERS\"]",
              "tap KEY once for each of the letters, and expect that letter at the\n"
              "cursor. Without letters: tap KEY once for each of the next lines that\n"
              "begin with a quote or *, and expect the SIGHT that stands there",
-             Stage::panel, parseWalk},
+             false, parseWalk},
     StepKind{"hold", "KEY [POLLS]",
              "press KEY and wait until it has answered that many key requests;\n"
              "the key stays down, and another hold goes on counting. Without POLLS:\n"
              "hold KEY for one poll more before each SIGHT in the next lines",
-             Stage::panel, parseHold},
+             false, parseHold},
     StepKind{"release", "",
              "let the key come up, and wait until a whole poll has gone by without\n"
              "it",
-             Stage::panel, parseRelease},
-    StepKind{"wait", "SECONDS", "let this time pass", Stage::panel, parseWait},
-    StepKind{"expect", "SIGHT", "wait until the panel shows SIGHT", Stage::panel, parseExpect},
+             false, parseRelease},
+    StepKind{"wait", "SECONDS", "let this time pass", false, parseWait},
+    StepKind{"expect", "SIGHT", "wait until the panel shows SIGHT", false, parseExpect},
     StepKind{"expect-cursor", "ROW COLUMN on|off",
-             "wait until the cursor is there, and blinks or does not", Stage::panel,
-             parseExpectCursor},
+             "wait until the cursor is there, and blinks or does not", false, parseExpectCursor},
     StepKind{"picture", "NAME", "print what the display shows, with v or ^ at a blinking cursor",
-             Stage::panel, parsePicture},
-    StepKind{"say", "TEXT", "print the rest of the line", Stage::panel, parseSay},
-    StepKind{"limit", "SECONDS", "let each step from here on wait so long for the panel",
-             Stage::panel, parseLimit},
+             false, parsePicture},
+    StepKind{"say", "TEXT", "print the rest of the line", false, parseSay},
+    StepKind{"limit", "SECONDS", "let each step from here on wait so long for the panel", false,
+             parseLimit},
     StepKind{"run", "COMMAND",
              "have /bin/sh run the rest of the line, which has to end with status 0\n"
              "within 60 seconds; whatever it leaves running is ended",
-             Stage::panel, parseRun},
+             false, parseRun},
     StepKind{"appliance", "VERB...",
              "change something at the appliance that the program runs on, or check\n"
              "something there, with one of the verbs below",
-             Stage::panel, parseAppliance},
+             false, parseAppliance},
     StepKind{"scene", "TITLE",
              "set up a fresh appliance, whose program starts at the next step that is\n"
              "not about the appliance",
-             Stage::test, parseScene},
+             true, parseScene},
     StepKind{"with", "WORD...",
              "stands in a scene, and gives it a table: the scene is played once for\n"
              "each such line, and $1 to $9 in its other lines stand for these words",
-             Stage::test, parseWith},
+             true, parseWith},
     StepKind{"prints", "\"COMMAND\" \"OUTPUT\"",
-             "from here on let this command line of the program print this", Stage::test,
-             parsePrints},
+             "from here on let this command line of the program print this", true, parsePrints},
     StepKind{"answer", "HEX...",
              "let the program read these bytes in place of the panel's next answer;\n"
              "20*40 means the byte 20 forty times",
-             Stage::test, parseAnswer},
+             true, parseAnswer},
     StepKind{"expect-sent", "[HEX...]",
              "check that, apart from key requests, just these bytes have been sent\n"
              "since the last step that pressed a key",
-             Stage::test, parseExpectSent},
+             true, parseExpectSent},
     StepKind{"expect-pause", "SECONDS SIGHT",
              "check how long the next pause was in which no key was read, and what\n"
              "the panel showed in the meantime",
-             Stage::test, parseExpectPause},
+             true, parseExpectPause},
     StepKind{"expect-run", "\"COMMAND\" SIGHT",
              "check the command line of the configuration script's next run, and what\n"
              "the panel showed in the meantime",
-             Stage::test, parseExpectRun},
+             true, parseExpectRun},
 };
 
 std::string usage(const StepKind &kind) {
@@ -391,7 +389,7 @@ ParsedStep parseStep(std::string_view line, Stage stage) {
                                     [&](const StepKind &each) { return each.name == name; });
     if (kind == stepKinds.end())
         reject("'" + std::string(name) + "' is not a step");
-    if (kind->stage == Stage::test && stage != Stage::test)
+    if (kind->needsTest && stage != Stage::test)
         reject("'" + std::string(name) +
                "' can be used only in the program's tests, in virtual time");
     Arguments arguments(line.substr(name.size()));
@@ -410,7 +408,7 @@ std::string stepsHelp(Stage stage) {
     constexpr std::size_t indent = 21;
     std::string text;
     for (const StepKind &kind : stepKinds) {
-        if (kind.stage == stage)
+        if (kind.needsTest == (stage == Stage::test))
             text += helpEntry("  " + usage(kind), kind.help, indent);
     }
     return text + (stage == Stage::panel ? "The appliance's verbs are:\n" + verbsHelp() : "");

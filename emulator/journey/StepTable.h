@@ -21,7 +21,8 @@ using ParsedStep = std::variant<Action, step::Walk>;
 /// std::invalid_argument with what is wrong.
 ParsedStep parseStep(std::string_view line, Stage stage);
 
-/// What can be written in a journey: each step's usage and what it does, for `--help`.
+/// The usage of each step and what it does, for `--help`: of those that can be played anywhere or,
+/// for Stage::test, of those that only a test adds.
 std::string stepsHelp(Stage stage);
 
 /// The word as it has to stand in a journey to be read as `text`: in quotes, with \", \\ and \n.

@@ -50,7 +50,7 @@ struct Expect {
 };
 
 struct ExpectCursor {
-    Sight::Cursor place;
+    Display::Place place;
     bool blinking;
 };
 

@@ -1,5 +1,8 @@
 #include "emulator/line/Line.h"
 
+#include "emulator/base/Number.h"
+#include "emulator/line/lineByteTime.h"
+
 #include <fcntl.h>
 #include <poll.h>
 #include <termios.h>
@@ -13,10 +16,6 @@
 namespace emulator {
 
 namespace {
-
-// 2400 baud; a byte is a start bit, eight data bits and two stop bits.
-constexpr std::chrono::nanoseconds bitTime{std::nano::den / 2400};
-constexpr int bitsPerByte = 11;
 
 constexpr std::size_t backlogBytes = 4096;
 
@@ -32,7 +31,7 @@ constexpr std::chrono::milliseconds answerLook{10};
 
 Line::Line(bool fast, const std::optional<std::string> &tracePath)
     : master(posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK | O_CLOEXEC)),
-      byteTime(fast ? Clock::duration::zero() : bitTime * bitsPerByte) {
+      byteTime(fast ? Clock::duration::zero() : lineByteTime) {
     if (master.get() < 0 || grantpt(master.get()) != 0 || unlockpt(master.get()) != 0)
         fail("cannot open a pseudo-terminal");
     std::array<char, 128> name{};
@@ -127,12 +126,10 @@ void Line::answer(unsigned char keyCode) {
 void Line::trace(char direction, TimePoint time, const unsigned char *bytes, std::size_t count) {
     if (!traceFile.is_open())
         return;
-    constexpr std::array<const char *, 16> digits{"0", "1", "2", "3", "4", "5", "6", "7",
-                                                  "8", "9", "a", "b", "c", "d", "e", "f"};
     const std::chrono::nanoseconds sinceStart = time.time_since_epoch();
     traceFile << sinceStart.count() << ' ' << direction;
     for (std::size_t i = 0; i < count; i++)
-        traceFile << ' ' << digits.at(bytes[i] >> 4U) << digits.at(bytes[i] & 0xFU);
+        traceFile << ' ' << hexadecimal(bytes[i]);
     traceFile << '\n' << std::flush;
 }
 

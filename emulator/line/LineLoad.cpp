@@ -1,14 +1,13 @@
 #include "emulator/line/LineLoad.h"
 
-#include <array>
-#include <cstdio>
+#include "emulator/base/Number.h"
+#include "emulator/line/lineByteTime.h"
 
 namespace emulator {
 
 namespace {
 
 constexpr std::chrono::seconds rateTime{1};
-constexpr double lineBytesPerSecond = 2400.0 / 11;
 
 } // namespace
 
@@ -30,16 +29,13 @@ void LineLoad::look(TimePoint now) {
 
 std::string LineLoad::recentBytes() const {
     std::string text;
-    for (const unsigned char byte : recent) {
-        std::array<char, 4> digits{};
-        std::snprintf(digits.data(), digits.size(), "%02X ", static_cast<unsigned>(byte));
-        text += digits.data();
-    }
+    for (const unsigned char byte : recent)
+        text += hexadecimal(byte) + " ";
     return text;
 }
 
 double LineLoad::percent() const {
-    return 100 * rate / lineBytesPerSecond;
+    return 100 * rate * std::chrono::duration<double>(lineByteTime).count();
 }
 
 } // namespace emulator

@@ -18,8 +18,9 @@ enum Command : unsigned char {
     cursorLeft = 0x10,
     cursorRight = 0x14,
     functionSet = 0x28,
-    row1Address = 0x40,
+    moduleRow1Address = 0x40,
     row0Address = 0x80,
+    row1Address = 0xC0,
 };
 
 } // namespace
@@ -60,6 +61,12 @@ int Display::cursorColumn() const {
     return position % columns;
 }
 
+std::optional<Display::Place> Display::visibleCursor() const {
+    if (!isBlinking || cursorColumn() >= visibleColumns)
+        return std::nullopt;
+    return Place{cursorRow(), cursorColumn()};
+}
+
 bool Display::execute(unsigned char command) {
     switch (command) {
     case noOperation:
@@ -92,8 +99,10 @@ bool Display::execute(unsigned char command) {
     }
     // Address 68 hex is one past the end of row 1. The counter takes it as it takes running past
     // 67 hex, starting over at 00, so that a step to the left from it is row 1's last column.
-    if (command >= row1Address && command <= row1Address + columns) {
-        position = (columns + command - row1Address) % positions;
+    if (command >= moduleRow1Address && command <= moduleRow1Address + columns) {
+        position = (columns + command - moduleRow1Address) % positions;
+    } else if (command >= row1Address && command < row1Address + columns) {
+        position = columns + command - row1Address;
     } else if (command >= row0Address && command < row0Address + columns) {
         position = command - row0Address;
     } else {

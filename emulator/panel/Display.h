@@ -1,6 +1,7 @@
 #pragma once
 
 #include <array>
+#include <optional>
 #include <string>
 
 namespace emulator {
@@ -10,7 +11,9 @@ namespace emulator {
 ///
 /// One address counter runs through both rows: row 0 at DDRAM addresses 00 to 27 hex, row 1 at
 /// 40 to 67 hex, the end of each followed by the start of the other. A byte FE announces that the
-/// next byte is a command; every other byte is a character for the cursor's position.
+/// next byte is a command; every other byte is a character for the cursor's position. Row 1 is
+/// reached in two ways, by the controller's own command and by a shorter one of this module, which
+/// stands where the controller has its custom characters. There are none of these.
 class Display {
   public:
     static constexpr int rowCount = 2;
@@ -27,9 +30,16 @@ class Display {
     /// All 40 characters of row 0 or 1.
     [[nodiscard]] std::string wholeRow(int row) const;
 
+    struct Place {
+        int row;    ///< 0 or 1
+        int column; ///< 0 to 39
+    };
+
     [[nodiscard]] int cursorRow() const;
     [[nodiscard]] int cursorColumn() const;
     [[nodiscard]] bool cursorBlinking() const { return isBlinking; }
+    /// Where the glass shows a blinking cursor, if it shows one.
+    [[nodiscard]] std::optional<Place> visibleCursor() const;
 
     /// How often a program has opened the panel.
     [[nodiscard]] unsigned long openings() const { return functionSets / setsPerOpening; }

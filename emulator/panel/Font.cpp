@@ -1,5 +1,7 @@
 #include "emulator/panel/Font.h"
 
+#include <algorithm>
+
 namespace emulator {
 
 namespace {
@@ -109,6 +111,11 @@ constexpr Glyph box{0x1F, 0x11, 0x11, 0x11, 0x11, 0x11, 0x1F, 0x00};
 
 const Glyph &glyph(char character) {
     return isPrintable(character) ? glyphs.at(static_cast<std::size_t>(character - ' ')) : box;
+}
+
+std::string printable(std::string text) {
+    std::replace_if(text.begin(), text.end(), [](char c) { return !isPrintable(c); }, '?');
+    return text;
 }
 
 } // namespace emulator

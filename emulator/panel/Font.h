@@ -2,6 +2,7 @@
 
 #include <array>
 #include <cstdint>
+#include <string>
 
 namespace emulator {
 
@@ -17,5 +18,8 @@ const Glyph &glyph(char character);
 constexpr bool isPrintable(char character) {
     return character >= ' ' && character <= '~';
 }
+
+/// The text with a question mark in place of every other byte.
+std::string printable(std::string text);
 
 } // namespace emulator

@@ -3,6 +3,8 @@
 #include "emulator/panel/Font.h"
 
 #include <algorithm>
+#include <fstream>
+#include <stdexcept>
 
 namespace emulator {
 
@@ -23,11 +25,6 @@ constexpr int pixelsPerDot = 4;
 
 std::string number(int value) {
     return std::to_string(value);
-}
-
-std::string printable(std::string text) {
-    std::replace_if(text.begin(), text.end(), [](char c) { return !isPrintable(c); }, '?');
-    return text;
 }
 
 std::string escaped(const std::string &text) {
@@ -69,17 +66,13 @@ std::string rectangle(int x, int y, int w, int h, const std::string &attributes)
 
 } // namespace
 
-Picture::Picture(const Display &display) {
+Picture::Picture(const Display &display) : cursor(display.visibleCursor()) {
     for (int row = 0; row < Display::rowCount; row++)
         rows.at(static_cast<std::size_t>(row)) = display.visibleRow(row);
-    if (display.cursorBlinking() && display.cursorColumn() < Display::visibleColumns) {
-        cursorRow = display.cursorRow();
-        cursorColumn = display.cursorColumn();
-    }
 }
 
-Picture::Picture(const Rows &itsRows, int itsCursorRow, int itsCursorColumn)
-    : rows(itsRows), cursorRow(itsCursorRow), cursorColumn(itsCursorColumn) {
+Picture::Picture(const Rows &itsRows, std::optional<Display::Place> itsCursor)
+    : rows(itsRows), cursor(itsCursor) {
     for (std::string &row : rows)
         row.resize(Display::visibleColumns, ' ');
 }
@@ -87,8 +80,8 @@ Picture::Picture(const Rows &itsRows, int itsCursorRow, int itsCursorColumn)
 std::string Picture::text() const {
     const auto border = [this](int row, char mark) {
         std::string line(Display::visibleColumns, '-');
-        if (row == cursorRow)
-            line.at(static_cast<std::size_t>(cursorColumn)) = mark;
+        if (cursor && row == cursor->row)
+            line.at(static_cast<std::size_t>(cursor->column)) = mark;
         return "+" + line + "+\n";
     };
     return border(0, 'v') + "|" + printable(rows[0]) + "|\n|" + printable(rows[1]) + "|\n" +
@@ -121,13 +114,21 @@ std::string Picture::svg() const {
         svg += "<path transform=\"translate(.05 .5)\" d=\"" + dots +
                "\" stroke=\"#1d2a10\" stroke-width=\".9\" stroke-dasharray=\".9 .1\"/>\n";
     }
-    if (cursorRow >= 0) {
-        svg += rectangle(textLeft + cursorColumn * cellPitch, textLeft + cursorRow * rowPitch,
+    if (cursor) {
+        svg += rectangle(textLeft + cursor->column * cellPitch, textLeft + cursor->row * rowPitch,
                          glyphColumns, glyphRows, "fill=\"#1d2a10\" fill-opacity=\".45\">") +
                "<animate attributeName=\"visibility\" values=\"visible;hidden\" dur=\"0.8s\" "
                "calcMode=\"discrete\" repeatCount=\"indefinite\"/></rect>\n";
     }
     return svg + "</svg>\n";
+}
+
+void Picture::write(const std::filesystem::path &path) const {
+    std::ofstream file(path, std::ios::binary);
+    file << svg();
+    file.close();
+    if (!file)
+        throw std::runtime_error("cannot write " + path.string());
 }
 
 } // namespace emulator

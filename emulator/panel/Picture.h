@@ -3,6 +3,8 @@
 #include "emulator/panel/Display.h"
 
 #include <array>
+#include <filesystem>
+#include <optional>
 #include <string>
 
 namespace emulator {
@@ -14,18 +16,19 @@ class Picture {
 
     explicit Picture(const Display &display);
     /// A picture of two rows of text, padded or cut to 16 columns, with a cursor if it has a place.
-    explicit Picture(const Rows &itsRows, int itsCursorRow = -1, int itsCursorColumn = -1);
+    explicit Picture(const Rows &itsRows, std::optional<Display::Place> itsCursor = std::nullopt);
 
     /// A frame of four lines. A blinking cursor is marked at its column in the border next to its
     /// row; bytes that are not printable ASCII show as question marks.
     [[nodiscard]] std::string text() const;
     /// An SVG file of the display's dots.
     [[nodiscard]] std::string svg() const;
+    /// Writes the SVG file to `path`. Throws std::runtime_error if that fails.
+    void write(const std::filesystem::path &path) const;
 
   private:
     Rows rows;
-    int cursorRow = -1; // -1 where no cursor is seen
-    int cursorColumn = -1;
+    std::optional<Display::Place> cursor; // if one is seen
 };
 
 } // namespace emulator

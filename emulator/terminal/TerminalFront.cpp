@@ -238,15 +238,11 @@ void TerminalFront::draw(TimePoint now) {
 
 void TerminalFront::drawGlass(TimePoint now) const {
     const attr_t colours = has_colors() ? static_cast<attr_t>(COLOR_PAIR(glassColours)) : A_NORMAL;
-    for (int row = 0; row < Display::rowCount; row++) {
-        std::string text = display.visibleRow(row);
-        std::replace_if(text.begin(), text.end(), [](char c) { return !isPrintable(c); }, '?');
-        put({glassAt.y + 1 + row, glassAt.x + 1}, text, colours);
-    }
-    const bool on = now.time_since_epoch() / blinkTime % 2 == 0;
-    const int column = display.cursorColumn();
-    if (display.cursorBlinking() && on && column < Display::visibleColumns)
-        put({glassAt.y + 1 + display.cursorRow(), glassAt.x + 1 + column}, " ",
+    for (int row = 0; row < Display::rowCount; row++)
+        put({glassAt.y + 1 + row, glassAt.x + 1}, printable(display.visibleRow(row)), colours);
+    const bool isOn = now.time_since_epoch() / blinkTime % 2 == 0;
+    if (const auto cursor = display.visibleCursor(); cursor && isOn)
+        put({glassAt.y + 1 + cursor->row, glassAt.x + 1 + cursor->column}, " ",
             colours | A_REVERSE);
 }
 

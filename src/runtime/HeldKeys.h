@@ -21,7 +21,9 @@ class HeldKeys {
     static constexpr std::uint32_t lastShortPoll = 5;
     static constexpr std::uint32_t firstLongPoll = 6;
 
-    std::uint32_t upHeld = 0; // consecutive polls of each key; at most one of the four is not 0
+    // Consecutive polls of each key. At most one of the four is not 0, but with a counter of its
+    // own no key can be taken for another.
+    std::uint32_t upHeld = 0;
     std::uint32_t downHeld = 0;
     std::uint32_t escapeHeld = 0;
     std::uint32_t enterHeld = 0;

@@ -69,7 +69,7 @@ class LcdPanel {
     void drawMarquee();
 
     SerialLine line;
-    std::int32_t commandPrefix; ///< its low byte is sent
+    std::int32_t commandPrefix; ///< FE hex; as the line carries bytes, only the low one is sent
     HeldKeys heldKeys;
     Marquee marquee;
 };

@@ -97,7 +97,7 @@ class WithoutTerminal(unittest.TestCase):
             self.assertEqual((done.returncode, done.stderr), (0, ""))
             self.assertIn("| fd b7 3        |", done.stdout)
             self.assertIn("</svg>", Path(folder, "new/end.svg").read_text(encoding="ascii"))
-            self.assertIn("> fd be", Path(folder, "trace").read_text(encoding="ascii"))
+            self.assertIn("> FD BE", Path(folder, "trace").read_text(encoding="ascii"))
 
     def test_what_goes_wrong_is_said_once_and_told_by_the_status(self):
         for status, said, journey, options, command in (
@@ -201,7 +201,7 @@ class OnTerminal(unittest.TestCase):
             terminal = Terminal("--record", record, "--trace", str(trace))
             terminal.read_until(b"ready")
             # Held until another key is held; then typed.
-            for keys, answer in ((b"u", "fd be"), (b"d", "fd bd"), (b"d\033[A\r", "fd bb")):
+            for keys, answer in ((b"u", "FD BE"), (b"d", "FD BD"), (b"d\033[A\r", "FD BB")):
                 terminal.type(keys)
                 while f"> {answer}" not in trace.read_text(encoding="ascii"):
                     self.assertIsNone(terminal.process.poll())

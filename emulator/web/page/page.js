@@ -191,8 +191,9 @@ element("save").addEventListener("click", async () => {
   try {
     const text = state.journey ?? await fetched("journey", "text");
     const head = text.split("\n", 2).join("\n") + "\n";
+    const added = new TextEncoder().encode(text).slice(opened);  // which counts bytes
     const link = document.createElement("a");
-    link.href = URL.createObjectURL(new Blob([head, text.slice(opened)], { type: "text/plain" }));
+    link.href = URL.createObjectURL(new Blob([head, added], { type: "text/plain" }));
     link.download = "panel.journey";
     link.click();
     setTimeout(() => URL.revokeObjectURL(link.href), 1000);
