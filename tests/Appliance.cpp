@@ -58,6 +58,11 @@ std::string without(const std::string &text,
     return rest;
 }
 
+bool isAddress(const std::string &text) {
+    in_addr address{};
+    return inet_pton(AF_INET, text.c_str(), &address) == 1;
+}
+
 } // namespace
 
 std::string contents(const std::filesystem::path &path) {
@@ -197,7 +202,7 @@ int Appliance::runScript(const Words &arguments) {
     return EXIT_SUCCESS;
 }
 
-// The real script checks the values; this one does not.
+// The real script checks more of what it is given.
 int Appliance::configurePort(const Words &arguments) {
     const std::string &port = arguments.at(2);
     std::map<std::string, Words> given;
@@ -218,6 +223,8 @@ int Appliance::configurePort(const Words &arguments) {
              dhcpServer->substr(0, lastOctet) + "100" + dhcpServer->substr(dhcpServer->find('/'))});
     } else {
         const std::string &address = given["--ipaddress"].at(0), &mask = given["--netmask"].at(0);
+        if (!isAddress(address) || !isAddress(mask))
+            return EXIT_FAILURE;
         const auto prefix = std::bitset<32>(inet_addr(mask.c_str())).count();
         act({"port", port, address + "/" + std::to_string(prefix)});
         stanza = "static\n    address " + address + "\n    netmask " + mask + "\n";

@@ -12,7 +12,7 @@
 namespace {
 
 constexpr unsigned journeyCount = JOURNEY_COUNT;
-constexpr long long leastTurns = journeyCount * 12'500LL;
+constexpr long long leastTurns = 12'500; // of each journey, on average
 constexpr int actionsPerJourney = 900;
 
 using Lines = std::vector<std::string>;
@@ -125,8 +125,13 @@ Lines shortest(Lines journey) {
 } // namespace
 
 TEST(RandomOperator, FindsNoScreenThatBreaksItsPromises) {
+    // By hand, PANEL_SEEDS=FIRST-LAST plays others.
+    unsigned first = 1, last = journeyCount;
+    if (const char *seeds = getenv("PANEL_SEEDS")) {
+        ASSERT_EQ(sscanf(seeds, "%u-%u", &first, &last), 2) << "PANEL_SEEDS=FIRST-LAST";
+    }
     long long turns = 0;
-    for (unsigned seed = 1; seed <= journeyCount; ++seed) {
+    for (unsigned seed = first; seed <= last; ++seed) {
         const Lines journey = randomJourney(seed);
         const Outcome outcome = playLines(journey);
         turns += outcome.turns;
@@ -136,6 +141,6 @@ TEST(RandomOperator, FindsNoScreenThatBreaksItsPromises) {
         play(readJourney(text, "random"));
         FAIL() << "seed " << seed << ", the shortest journey:\n" << text;
     }
-    EXPECT_GE(turns, leastTurns);
+    EXPECT_GE(turns, (last - first + 1) * leastTurns);
     std::cout << turns << " turns\n";
 }

@@ -22,8 +22,16 @@ std::string sentBy(const std::function<void(LcdPanel &)> &action) {
 FRESH_TEST(Runtime, TheLineIsConfiguredBeforeMain) {
     EXPECT_EQ(world().sent, "\xFE\x28\xFE\x28\xFE\x01\xFE\x02");
     EXPECT_EQ(world().writes, std::vector<std::size_t>(8, 1));
-    EXPECT_EQ(world().events.size(), 6U);
-    EXPECT_EQ(world().events.front(), "start stty ispeed 2400 < /dev/ttyS1");
+    const std::string stty = "start stty -F /dev/ttyS1 ";
+    EXPECT_EQ(world().events,
+              (std::vector<std::string>{
+                  "start stty ispeed 2400 < /dev/ttyS1", "start stty raw < /dev/ttyS1",
+                  stty + "-ignbrk -brkint -parmrk -inpck -istrip -inlcr -igncr -icrnl -iuclc"
+                         " -ixon -ixany -ixoff -imaxbel ignpar",
+                  stty + "-opost -olcuc -onlcr -ocrnl -onocr -onlret -ofill -ofdel nl0 cr0 tab0"
+                         " bs0 vt0 ff0",
+                  stty + "-parenb -crtscts -parodd -hupcl cread cs8 cstopb clocal",
+                  stty + "-isig -icanon -iexten -echo noflsh"}));
 }
 
 FRESH_TEST(Runtime, TheCursorGoesWhereItIsSent) {

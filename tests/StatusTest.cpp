@@ -29,6 +29,9 @@ FRESH_TEST(Status, PagesStayFiveSecondsFromTheFirstPollOn) {
     person.poll();
     const Micros start = world().now - 100ms;
     EXPECT_EQ(world().shown(), product);
+    EXPECT_EQ(std::count_if(world().events.begin(), world().events.end(),
+                            [](auto &event) { return boost::contains(event, "ifconfig -s"); }),
+              1);
     drawAt(person, start, 5);
     EXPECT_EQ(world().shown(), product);
     drawAt(person, start, 5.000001);

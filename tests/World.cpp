@@ -61,6 +61,13 @@ void World::pass(Micros time, bool forAnswer) {
         now = std::min(end, wakeAt());
 }
 
+void World::passWhole(Micros time) {
+    for (const Micros end = now + time; now < end;) {
+        hasSignalled = false;
+        pass(end - now);
+    }
+}
+
 // The linker directs the calls of the program, and only those, to these functions and dictates
 // their names.
 // NOLINTBEGIN(bugprone-reserved-identifier,readability-inconsistent-declaration-parameter-name)
@@ -161,14 +168,11 @@ FILE *__wrap_popen(const char *command, const char *mode) {
         w.runs.push_back({command, w.rows()});
     if (arguments.empty() || w.appliance.fact(std::string("prints ") + command)) {
         const std::string output = w.appliance.output(command);
-        w.pass(w.commandTime);
+        w.passWhole(w.commandTime);
         return openContents(output);
     }
     const std::string talk = w.appliance.fact("script") == "chatters" ? "Reloading\n" : "";
-    for (const Micros end = w.now + w.appliance.scriptTime(); w.now < end;) {
-        w.hasSignalled = false; // which does not end a script
-        w.pass(end - w.now);
-    }
+    w.passWhole(w.appliance.scriptTime());
     return openContents(talk + std::to_string(w.appliance.runScript(arguments)) + "\n");
 }
 

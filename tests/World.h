@@ -64,6 +64,8 @@ struct World {
     }
     /// Lets this time pass or, if `forAnswer`, less of it if an answer comes earlier.
     void pass(Micros time, bool forAnswer = false);
+    /// Lets all of this time pass, as a command does that no signal ends.
+    void passWhole(Micros time);
 };
 
 /// The one world. It exists before the first static initialiser that asks for it.

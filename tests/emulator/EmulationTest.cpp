@@ -1,5 +1,6 @@
 #include "emulator/journey/JourneyPlayer.h"
 #include "emulator/line/Line.h"
+#include "emulator/line/LineLoad.h"
 #include "emulator/panel/Font.h"
 #include "emulator/panel/Picture.h"
 
@@ -50,6 +51,15 @@ TEST(Display, PutsBytesWhereTheControllerDoes) {
         EXPECT_EQ(std::pair(display.cursorRow(), display.cursorColumn()), c.cursor) << text;
         EXPECT_EQ(std::pair(display.unknownCommands(), display.hiddenCharacters()), c.odd) << text;
     }
+}
+
+TEST(LineLoad, IsFullAt218BytesASecond) {
+    const TimePoint start;
+    LineLoad load(start);
+    for (int k = 0; k < 218; k++)
+        load.carried(0xFE);
+    load.look(start + std::chrono::seconds(1));
+    EXPECT_NEAR(load.percent(), 99.9, 0.05);
 }
 
 TEST(Picture, ShowsDotsAndAVisibleCursor) {

@@ -106,9 +106,13 @@ TEST(Finger, HoldsUntilAnyOtherKeyAndAClickIsNotLost) {
     hand.finger.release(hand.now);
     hand.finger.tap(Key::down, hand.now);
     EXPECT_EQ(hand.polls(5), ".d...");
-    hand.finger.press(Key::escape, hand.now);
-    hand.finger.release(hand.now); // before anybody has asked
-    EXPECT_EQ(hand.polls(3), "x..");
+    for (const auto &[time, answers] : {std::pair(399ms, "x.."), std::pair(400ms, "...")}) {
+        hand.finger.hold(Key::up);
+        EXPECT_EQ(hand.polls(1), "u"); // the program asks again at the next poll
+        hand.finger.press(Key::escape, hand.now);
+        hand.finger.release(hand.now + time);
+        EXPECT_EQ(hand.polls(3), answers);
+    }
 }
 
 } // namespace
