@@ -205,6 +205,7 @@ int Appliance::runScript(const Words &arguments) {
 // The real script checks more of what it is given.
 int Appliance::configurePort(const Words &arguments) {
     const std::string &port = arguments.at(2);
+    const std::set<std::string> options{"--dhcp", "--ipaddress", "--netmask", "--gateway", "--dns"};
     std::map<std::string, Words> given;
     std::string option;
     for (const std::string &word : Words(arguments.begin() + 3, arguments.end())) {
@@ -212,6 +213,10 @@ int Appliance::configurePort(const Words &arguments) {
             given[option = word];
         else
             given[option].push_back(word);
+    }
+    for (const auto &[name, values] : given) {
+        if (!options.count(name))
+            return EXIT_FAILURE;
     }
     const auto dhcpServer = fact("server " + port);
     if (!fact("port " + port) || (given.count("--dhcp") && !dhcpServer))

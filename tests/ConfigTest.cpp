@@ -1,4 +1,4 @@
-#include "Operator.h"
+#include "RunningProgram.h"
 
 #include "netconfig/NetworkConfig.h"
 

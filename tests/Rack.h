@@ -3,7 +3,7 @@
 // an operator does.
 #pragma once
 
-#include "Operator.h"
+#include "RunningProgram.h"
 
 #include "emulator/journey/JourneyPlayer.h"
 

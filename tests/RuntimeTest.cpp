@@ -1,4 +1,4 @@
-#include "Operator.h"
+#include "RunningProgram.h"
 
 #include "runtime/LcdPanel.h"
 #include "runtime/String.h"

@@ -1,4 +1,4 @@
-#include "Operator.h"
+#include "RunningProgram.h"
 
 #include "netconfig/RestartNetworkingMenu.h"
 #include "runtime/MenuContext.h"
@@ -46,12 +46,12 @@ FRESH_TEST(Screens, TheRestartIsWaitedForUntilAKeyComes) {
 
 FRESH_TEST(Screens, EnterOnAPortComputesThePageBeforeIt) {
     standardAppliance();
-    Operator person;
+    RunningProgram program;
     for (int page = 0; page < 4; ++page) // to the first port
-        person.press(Key::down);
+        program.press(Key::down);
     world().appliance.act({"file", "/etc/network/interfaces", ""});
     world().events.clear();
-    person.poll(Key::enter);
+    program.poll(Key::enter);
     EXPECT_EQ(world().events,
               (std::vector<std::string>{"open /etc/network/interfaces", "open /etc/resolv.conf",
                                         "open /opt/kestrova/seq.site_conn",

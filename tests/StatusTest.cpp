@@ -1,4 +1,4 @@
-#include "Operator.h"
+#include "RunningProgram.h"
 
 #include "status/PageTexts.h"
 
@@ -13,9 +13,9 @@ namespace {
 constexpr Micros answerTime = 25ms; // from the start of a poll to its drawing
 
 // Lets one turn draw exactly this long after `start`.
-void drawAt(Operator &person, Micros start, double seconds) {
+void drawAt(RunningProgram &program, Micros start, double seconds) {
     world().now = start + Micros(std::llround(seconds * 1e6)) - answerTime;
-    person.answer("?");
+    program.answer("?");
 }
 
 const std::string product = "Kestrova (TM)|cabinetDevice";
@@ -24,32 +24,32 @@ const std::string product = "Kestrova (TM)|cabinetDevice";
 
 FRESH_TEST(Status, PagesStayFiveSecondsFromTheFirstPollOn) {
     standardAppliance();
-    Operator person;
+    RunningProgram program;
     EXPECT_EQ(world().shown(), "|");
-    person.poll();
+    program.poll();
     const Micros start = world().now - 100ms;
     EXPECT_EQ(world().shown(), product);
     EXPECT_EQ(std::count_if(world().events.begin(), world().events.end(),
                             [](auto &event) { return boost::contains(event, "ifconfig -s"); }),
               1);
-    drawAt(person, start, 5);
+    drawAt(program, start, 5);
     EXPECT_EQ(world().shown(), product);
-    drawAt(person, start, 5.000001);
+    drawAt(program, start, 5.000001);
     EXPECT_EQ(world().shown(), "Hostname:|monitor");
 }
 
 FRESH_TEST(Status, APageThatWasChosenStaysForAMinute) {
     standardAppliance();
-    Operator person;
-    person.poll();
-    person.press(Key::up);
+    RunningProgram program;
+    program.poll();
+    program.press(Key::up);
     EXPECT_EQ(world().shown(), "E5 (eth5)|unused");
-    person.hold(Key::down, 6); // the first and the sixth poll act
+    program.hold(Key::down, 6); // the first and the sixth poll act
     EXPECT_EQ(world().shown(), "Hostname:|monitor");
     const Micros start = world().now - 225ms; // when the last of them was read
-    drawAt(person, start, 60);
+    drawAt(program, start, 60);
     EXPECT_EQ(world().shown(), "Hostname:|monitor");
-    drawAt(person, start, 60.000001);
+    drawAt(program, start, 60.000001);
     EXPECT_EQ(world().shown(), "Connected to:|no server");
 }
 
@@ -60,16 +60,16 @@ FRESH_TEST(Status, ALongRowKeepsItsPageUntilItIsRead) {
     world().appliance.act(
         {"file", "/opt/kestrova/config/nis.config", "NIS Address: management.example"});
     const std::string server = "Connected to:|management.examp";
-    Operator person;
-    person.poll();
-    person.poll(Key::down);
+    RunningProgram program;
+    program.poll();
+    program.poll(Key::down);
     const Micros start = world().now - 100ms; // when the page was drawn
     const std::string cycle = "abcdefghijklmnopqrs   abcdefghijklmnopqrs";
     const auto showsFrom = [&](double seconds, std::size_t offset) {
-        drawAt(person, start, seconds);
+        drawAt(program, start, seconds);
         EXPECT_EQ(world().display.visibleRow(1), cycle.substr(offset, 16)) << seconds;
     };
-    person.poll(Key::escape);
+    program.poll(Key::escape);
     showsFrom(2, 0);
     showsFrom(2.000001, 1);
     showsFrom(2.900001, 1);
@@ -77,31 +77,31 @@ FRESH_TEST(Status, ALongRowKeepsItsPageUntilItIsRead) {
     showsFrom(3.9, 3);      // the third does not
     showsFrom(4.9, 4);
     showsFrom(7.9, 5);
-    drawAt(person, start, 7.900003);
+    drawAt(program, start, 7.900003);
     EXPECT_EQ(world().shown(), server);
 }
 
 FRESH_TEST(Status, AKeysPageStartsItsTimeOnceItIsDrawn) {
     standardAppliance();
-    Operator person;
-    person.poll();
+    RunningProgram program;
+    program.poll();
     world().now += 5s;
     world().events.clear();
-    person.poll();
+    program.poll();
     EXPECT_EQ(world().events, (std::vector<std::string>{"clock", "run hostname", "row", "row"}));
     world().events.clear();
-    person.poll(Key::up);
-    person.poll(Key::down);
+    program.poll(Key::up);
+    program.poll(Key::down);
     EXPECT_EQ(world().events,
               (std::vector<std::string>{"row", "row", "clock", "clock", "clock", "run hostname",
                                         "row", "row", "clock", "clock", "clock"}));
     world().events.clear();
     world().sent.clear();
-    person.wait(1s);
+    program.wait(1s);
     EXPECT_EQ(world().events, (std::vector<std::string>{"clock", "clock"}));
     EXPECT_EQ(world().sent, std::string("\xFE\0\xFE\x06\xFE\0\xFE\x06", 8));
     world().clockWorks = false;
-    person.wait(100s);
+    program.wait(100s);
     EXPECT_EQ(world().shown(), "Hostname:|monitor");
 }
 
@@ -116,21 +116,21 @@ FRESH_TEST(Status, OneCarriageReturnBehindTheServerIsDropped) {
 
 FRESH_TEST(Status, AClockThatIsSetBackStopsTheRotationUntilAKeyOrAReload) {
     standardAppliance();
-    Operator person;
-    person.poll();
+    RunningProgram program;
+    program.poll();
     world().now -= 1h;
-    person.wait(600s);
+    program.wait(600s);
     EXPECT_EQ(world().shown(), product);
-    person.press(Key::down);
-    person.wait(59s);
+    program.press(Key::down);
+    program.wait(59s);
     EXPECT_EQ(world().shown(), "Hostname:|monitor");
-    person.wait(3s);
+    program.wait(3s);
     EXPECT_EQ(world().shown(), "Connected to:|no server");
 
     world().now -= 1h;
-    person.wait(600s);
+    program.wait(600s);
     EXPECT_EQ(world().shown(), "Connected to:|no server");
     raise(SIGUSR1);
-    person.poll();
+    program.poll();
     EXPECT_EQ(world().shown(), product);
 }

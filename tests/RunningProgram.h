@@ -29,10 +29,10 @@
 /// An appliance with one port, for tests that count pages.
 void standardAppliance();
 
-class Operator {
+class RunningProgram {
   public:
     /// Starts the program on the world as it is now.
-    Operator() : loop(new MainLoop(MainMenu::instance, MainMenu::requestRefresh)) {}
+    RunningProgram() : loop(new MainLoop(MainMenu::instance, MainMenu::requestRefresh)) {}
 
     /// One turn without a key, with one, or in which the panel sends just these bytes.
     void poll() { loop->turn(); }

@@ -1,4 +1,4 @@
-#include "Operator.h"
+#include "RunningProgram.h"
 
 #include <iostream>
 #include <sys/wait.h>
