@@ -17,6 +17,9 @@ for script in tests/box/box.sh tests/box/journey.sh \
         "$? $(grep -c '^mktemp: ' "$work/said") $(wc -l <"$work/said")"
 done
 
+expect "an unknown release" "test-fresh: unknown release '11' (see --help)" \
+    "$(sh scripts/test-fresh 12 11 2>&1)"
+
 # A build of nothing, made as the scripts make theirs.
 mkdir -p "$work/here/scripts"
 cp scripts/common.sh "$work/here/scripts"

@@ -1,13 +1,12 @@
-# The tests source this file. It makes a Debian 12 below $root, which is removed together with $work at
-# the end; `in_system` runs commands in it.
+# The tests source this file. It makes a Debian of release $release below $root, which is removed
+# together with $work at the end; `in_system` runs commands in it.
 . "${here:?}/../../scripts/bare-debian.sh"
 work=$(mktemp -d) || exit 1
 root=$work/root
 trap 'rm -rf "$work"' EXIT
 trap 'exit 1' HUP INT TERM
 
-export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
-container="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --directory=$root"
+container="$nspawn --directory=$root"
 in_system() {
     $container sh -c "apt() {
         apt-get -q update &&
@@ -20,3 +19,5 @@ give_up() {
     exit 1
 }
 must() { "$@" >"$work/log" 2>&1 || { cat "$work/log"; give_up "$@"; }; }
+
+must bare_debian "$root" "${release:?}"
