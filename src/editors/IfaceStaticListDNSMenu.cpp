@@ -45,8 +45,9 @@ void IfaceStaticListDNSMenu::display(MenuContext *) {
     if (!drawn.claimDrawing() || config == nullptr)
         return;
     readServers();
-    // A server that has been deleted may leave the selection past the end. Whoever comes back to the
-    // last server also starts again at the first: operators know the list that way, so it stays.
+    // A server that has been deleted may leave the selection past the end. Whoever comes back to
+    // the last server also starts again at the first: operators know the list that way, so it
+    // stays.
     if (window.selected() >= serverCount - 1)
         window.selectFirst();
     panel->showText(renderList());
