@@ -1,5 +1,7 @@
 #!/usr/bin/python3
-"""Who is let in by the emulator (the first argument), and what those can do who break the rules."""
+"""Who is let in by the emulator (the first argument), and what those can do who break the rules.
+
+Its memory may grow by as many KiB as the second argument says."""
 
 import contextlib
 import json
@@ -13,10 +15,10 @@ import websocket
 from panel import POLLER, Panel, wait_for
 
 EMULATOR = sys.argv.pop(1)
+MOST_GROWTH = int(sys.argv.pop(1))
 UPGRADE = {"Connection": "Upgrade", "Upgrade": "websocket", "Sec-WebSocket-Version": "13",
            "Sec-WebSocket-Key": "AAAAAAAAAAAAAAAAAAAAAA=="}
 CLOSED = (websocket.WebSocketConnectionClosedException, ConnectionError)
-MOST_GROWTH = 4096  # KiB: sanitizers take most of it
 
 
 class Limits(unittest.TestCase):
