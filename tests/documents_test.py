@@ -96,7 +96,6 @@ class Documents(unittest.TestCase):
 
         commands = {f"scripts/{entry.name}" for entry in (ROOT / "scripts").iterdir()
                     if entry.is_file() and os.access(entry, os.X_OK)}
-        commands.remove("scripts/map")  # which scripts/demo runs
         for page, heading, there in (("README.md", "## All commands", commands),
                                      ("README.md", "## Folders", folders(".")),
                                      ("docs/development.md", "## Folders", folders("src"))):

@@ -21,11 +21,11 @@ expect "an unknown release" "test-fresh: unknown release '11' (see --help)" \
     "$(sh scripts/test-fresh 12 11 2>&1)"
 
 # A build of nothing, made as the scripts make theirs.
-mkdir -p "$work/here/scripts"
-cp scripts/common.sh "$work/here/scripts"
+mkdir -p "$work/here/tools"
+cp tools/common.sh "$work/here/tools"
 printf 'cmake_minimum_required(VERSION 3.25)\nproject(nothing NONE)\n' >"$work/here/CMakeLists.txt"
 build() { # FOLDER
-    (cd "$1" && me=me && . scripts/common.sh &&
+    (cd "$1" && me=me && . tools/common.sh &&
         step build in_build build configure build -S . -B build -G Ninja) >"$work/said" 2>&1
     echo $?
 }
@@ -42,7 +42,7 @@ sleep 0.2
 expect "a second build waits for the first" "0 $work/first" "$(build "$work/copy") $(ls "$work/first")"
 
 one_line() { echo "$? $(grep -c "^me: .*$work/copy/build" "$work/said") $(wc -l <"$work/said")"; }
-in_copy='cd "$1" && me=me && . scripts/common.sh && in_build build true'
+in_copy='cd "$1" && me=me && . tools/common.sh && in_build build true'
 read_only -- sh -c "exec 2>&1; TMPDIR=/dev/shm; export TMPDIR; $in_copy" sh "$work/copy" >"$work/said"
 expect "a build that cannot be written to" "1 1 1" "$(one_line)"
 finish

@@ -1,6 +1,6 @@
 # The tests source this file. It makes a Debian of release $release below $root, which is removed
 # together with $work at the end; `in_system` runs commands in it.
-. "${here:?}/../../scripts/bare-debian.sh"
+. "${here:?}/../../tools/bare-debian.sh"
 work=$(mktemp -d) || exit 1
 root=$work/root
 trap 'rm -rf "$work"' EXIT
