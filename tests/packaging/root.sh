@@ -44,7 +44,7 @@ end_with_reboot() {
 # After a reboot, the appliance is as the operator has set it.
 come_back() {
     play "$here/rebooted.journey"
-    timeout 300 cat "$root/root/there" || { cat "$root/root/played"; give_up "to come back"; }
+    timeout 120 cat "$root/root/there" || { cat "$root/root/played"; give_up "to come back"; }
 }
 
 cp "$2"/kestrova-panel_*.deb "$2"/kestrova-panel-tools_*.deb "$root/root"
