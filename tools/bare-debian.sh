@@ -20,9 +20,9 @@ codename() {
     esac
 }
 
-# This runs a command in the system of a --directory, or boots it. What a power failure would do to that
-# system does not matter.
-export nspawn="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --suppress-sync=yes --machine=kestrova-$$"
+# This runs a command in the system of a --directory, or boots it. Without --suppress-sync, although a
+# power failure may well damage that system: it would forbid openat2, which Debian 13's sandbox needs.
+export nspawn="systemd-nspawn --quiet --register=no --keep-unit --console=pipe --machine=kestrova-$$"
 export SYSTEMD_NSPAWN_UNIFIED_HIERARCHY=1 SYSTEMD_NSPAWN_API_VFS_WRITABLE=1
 
 # is_own RELEASE: whether this machine runs this release.
