@@ -1,7 +1,6 @@
 #include "emulator/journey/expandTable.h"
 
 #include <algorithm>
-#include <regex>
 
 namespace emulator {
 
@@ -13,16 +12,27 @@ bool isRow(const TextLine &line) {
     return line.text.compare(0, 5, "with ") == 0;
 }
 
-// A quoted word may contain blanks and escaped quotes; a comment ends the words.
+// Quoted words keep their quotes, and may contain blanks and escaped quotes. A comment ends the
+// words.
 Words wordsOf(const TextLine &row) {
-    static const std::regex word(R"(#.*|"(\\.|[^"\\])*"|\S+)");
-    Words words;
-    for (std::sregex_iterator each(row.text.begin(), row.text.end(), word), end; each != end;
-         ++each)
-        words.push_back(each->str());
-    words.erase(std::find_if(words.begin(), words.end(),
-                             [](const std::string &text) { return text.front() == '#'; }),
-                words.end());
+    Words words{""};
+    bool isQuoted = false;
+    for (std::size_t at = 0; at < row.text.size(); at++) {
+        const char c = row.text[at];
+        if (!isQuoted && c == '#' && words.back().empty())
+            break;
+        if (!isQuoted && (c == ' ' || c == '\t')) {
+            if (!words.back().empty())
+                words.emplace_back();
+            continue;
+        }
+        isQuoted = isQuoted != (c == '"');
+        words.back() += c;
+        if (isQuoted && c == '\\' && at + 1 < row.text.size())
+            words.back() += row.text[++at];
+    }
+    if (words.back().empty())
+        words.pop_back();
     return words; // the first is "with"
 }
 
