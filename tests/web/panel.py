@@ -4,6 +4,7 @@ import http.client
 import json
 import socket
 import subprocess
+import time
 from pathlib import Path
 from urllib.parse import urlsplit
 
@@ -62,8 +63,10 @@ class Panel:
 
 
 def wait_for(page, **wanted):
-    """The first state from here on that is so."""
-    while True:
+    """The first state from here on that is so, within twenty seconds."""
+    give_up = time.monotonic() + 20
+    while time.monotonic() < give_up:
         state = json.loads(page.recv() or "null")
         if wanted.items() <= state.items():
             return state
+    raise AssertionError(f"no state with {wanted}")
