@@ -12,7 +12,7 @@ namespace emulator {
 /// One address counter runs through both rows: row 0 at DDRAM addresses 00 to 27 hex, row 1 at
 /// 40 to 67 hex, the end of each followed by the start of the other. A byte FE announces that the
 /// next byte is a command; every other byte is a character for the cursor's position. Row 1 is
-/// reached in two ways, by the controller's own command and by a shorter one of this module, which
+/// reached in two ways, by the controller's own command and by one of this module, which
 /// stands where the controller has its custom characters. There are none of these.
 class Display {
   public:
