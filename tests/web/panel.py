@@ -62,9 +62,9 @@ class Panel:
                                            origin=f"http://{self.host}", **options)
 
 
-def wait_for(page, **wanted):
-    """The first state from here on that is so, within twenty seconds."""
-    give_up = time.monotonic() + 20
+def wait_for(page, seconds=20, **wanted):
+    """The first state from here on that is so. It has to come within that many seconds."""
+    give_up = time.monotonic() + seconds
     while time.monotonic() < give_up:
         state = json.loads(page.recv() or "null")
         if wanted.items() <= state.items():

@@ -55,11 +55,11 @@ class Timing(unittest.TestCase):
                        for page in (deaf, flood)]
             for writer in writers:
                 writer.start()
-            wait_for(seen, polls=POLLS // 2)
+            wait_for(seen, 60, polls=POLLS // 2)
             # By now the one that does not read has been dropped, and the one that sends has not.
             self.assertEqual([writer.is_alive() for writer in writers], [False, True])
             self.assertLess(panel.memory(), memory + 2048)
-            wait_for(seen, ending="the journey was played to its end")
+            wait_for(seen, 60, ending="the journey was played to its end")
             self.assertEqual((panel.process.wait(10), alone.wait(10)), (0, 0))
         marks = []
         for trace in traces:
