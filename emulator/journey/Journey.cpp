@@ -118,26 +118,33 @@ void Journey::readSight(const TextLine &line) {
     if (!listing)
         throw std::invalid_argument("a sight stands behind a walk or a hold");
     listing->isEmpty = false;
-    add(line, listing->beforeEach);
-    add(line, std::get<Action>(parseStep("expect " + line.text, stage)));
+    addStep(line, listing->beforeEach);
+    addStep(line, std::get<Action>(parseStep("expect " + line.text, stage)));
 }
 
 void Journey::readStep(const TextLine &line) {
-    const ParsedStep parsed = parseStep(line.text, stage);
-    if (const auto *action = std::get_if<Action>(&parsed))
-        return add(line, *action);
-    const auto &walk = std::get<step::Walk>(parsed);
+    std::visit([&](const auto &parsed) { addStep(line, parsed); }, parseStep(line.text, stage));
+}
+
+void Journey::addStep(const TextLine &line, const step::Walk &walk) {
     const Action beforeEach = walk.isHold ? Action(step::Hold{walk.key, 1})
                                           : Action(step::Tap{walk.key, 1, std::nullopt});
     if (walk.letters.empty())
         listing = Listing{line.number, beforeEach, true};
     for (const char letter : walk.letters) {
-        add(line, beforeEach);
-        add(line, step::ExpectLetter{letter});
+        addStep(line, beforeEach);
+        addStep(line, Action(step::ExpectLetter{letter}));
     }
 }
 
-void Journey::add(const TextLine &line, const Action &action) {
+void Journey::addStep(const TextLine &line, const step::Choose &choice) {
+    Sight entry;
+    entry.chosen = choice.entry;
+    addStep(line, Action(step::Tap{Key::down, step::mostTapsUntil, entry}));
+    addStep(line, Action(step::Tap{Key::enter, 1, std::nullopt}));
+}
+
+void Journey::addStep(const TextLine &line, const Action &action) {
     if (allSteps.size() == mostSteps)
         throw std::invalid_argument("there are too many steps");
     // The one poll of a tap could not be told from those of the hold.

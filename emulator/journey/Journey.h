@@ -11,7 +11,8 @@
 namespace emulator {
 
 /// An operator's journey, read from a text with one step a line (see StepTable). The steps that
-/// follow from a walk, or from the table of a scene, are among its steps like any others.
+/// follow from a walk, from a choice or from the table of a scene, are among its steps like any
+/// others.
 class Journey {
   public:
     /// Reads a whole journey that is to be played on `stage`. Throws std::invalid_argument with
@@ -36,8 +37,10 @@ class Journey {
     void readLine(const TextLine &line);
     void readSight(const TextLine &line);
     void readStep(const TextLine &line);
+    void addStep(const TextLine &line, const Action &action);
+    void addStep(const TextLine &line, const step::Walk &walk);
+    void addStep(const TextLine &line, const step::Choose &choice);
     void endListing();
-    void add(const TextLine &line, const Action &action);
 
     std::string name;
     Stage stage;

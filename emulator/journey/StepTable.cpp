@@ -15,7 +15,6 @@ namespace emulator {
 namespace {
 
 constexpr int mostPolls = 100'000;
-constexpr int mostTapsUntil = 100;
 constexpr int mostRepeats = 255; // of a byte
 constexpr double mostSeconds = 86'400;
 constexpr std::string_view blanks = " \t\r";
@@ -167,7 +166,7 @@ ParsedStep parseTap(Arguments &words) {
     words.take("until");
     tap.until = words.takeSight();
     if (!isCounted)
-        tap.count = mostTapsUntil;
+        tap.count = step::mostTapsUntil;
     return tap;
 }
 
@@ -207,6 +206,10 @@ ParsedStep parseHold(Arguments &words) {
 ParsedStep parseWalk(Arguments &words) {
     const Key key = words.takeKey();
     return step::Walk{key, false, words.isEmpty() ? "" : words.take()};
+}
+
+ParsedStep parseChoose(Arguments &words) {
+    return step::Choose{words.take()};
 }
 
 ParsedStep parseWith(Arguments &) {
@@ -322,6 +325,8 @@ constexpr std::array stepKinds{
              "cursor. Without letters: tap KEY once for each of the next lines that\n"
              "begin with a quote or *, and expect the SIGHT that stands there",
              false, parseWalk},
+    StepKind{"choose", "\"ENTRY\"", "tap Down until this entry of a list is chosen, and then Enter",
+             false, parseChoose},
     StepKind{"hold", "KEY [POLLS]",
              "press KEY and wait until it has answered that many key requests;\n"
              "the key stays down, and another hold goes on counting. Without POLLS:\n"

@@ -15,10 +15,10 @@ enum class Stage {
     test,  ///< in a test, where the program's calls lead into a world of virtual time
 };
 
-using ParsedStep = std::variant<Action, step::Walk>;
+/// A step, or what stands for several: a walk, together with the sights behind it, and a choice.
+using ParsedStep = std::variant<Action, step::Walk, step::Choose>;
 
-/// Reads one step, or a walk, whose steps follow from it and from the sights behind it. Throws
-/// std::invalid_argument with what is wrong.
+/// Reads what one line says. Throws std::invalid_argument with what is wrong.
 ParsedStep parseStep(std::string_view line, Stage stage);
 
 /// The usage of each step and what it does, for `--help`: of those that can be played anywhere or,

@@ -21,6 +21,8 @@ struct Stroke {
 
 namespace step {
 
+constexpr int mostTapsUntil = 100; // if the journey does not say how many
+
 /// Presses a key for one poll, `count` times; with `until`, at most that often and only until the
 /// panel shows it.
 struct Tap {
@@ -65,6 +67,11 @@ struct Walk {
     Key key;
     bool isHold;
     std::string letters;
+};
+
+/// Taps Down until this entry of a list is chosen, and then Enter.
+struct Choose {
+    std::string entry;
 };
 
 struct TakePicture {

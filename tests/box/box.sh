@@ -2,9 +2,8 @@
 . "$(dirname "$0")/expect.sh"
 unset PANEL_TTY
 # The box is copied to where everyone may go, because the checkout may be out of reach for this user.
-copy=$(mktemp -d /tmp/box.XXXXXX) || exit 1
-trap 'rm -rf "$copy"' EXIT
-trap 'exit 1' HUP INT TERM
+TMPDIR=/tmp . "$(dirname "$0")/../scratch.sh"
+copy=$work
 cp -R "$(dirname "$0")/../../box" "$1" "$copy"
 cp -R "$copy/box/appliance" "$copy/broken"
 chmod -R a+rwX "$copy"

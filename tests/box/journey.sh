@@ -1,11 +1,9 @@
 # EMULATOR PROGRAM JOURNEY: plays a journey with the real program in the box. The pictures that it takes
 # have to be those of the documentation, byte for byte.
 cd "$(dirname "$(realpath "$0")")/../.." || exit 1
-taken=$(mktemp -d) || exit 1
-trap 'rm -r "$taken"' EXIT
-trap 'exit 1' HUP INT TERM
-"$1" --journey "$3" --pictures "$taken" -- box/kestrova-panel-box -- "$2" || exit 1
-for picture in "$taken"/*.svg; do
+. tests/scratch.sh
+"$1" --journey "$3" --pictures "$work" -- box/kestrova-panel-box -- "$2" || exit 1
+for picture in "$work"/*.svg; do
     cmp "$picture" "docs/pictures/${picture##*/}" || {
         echo "no longer what the panel shows: scripts/demo --renew-pictures renews the pictures"
         exit 1

@@ -1,9 +1,6 @@
 # Tests the builds that an integrator may want, from sources $1, and what each of them installs.
 . "$(dirname "$0")/../box/expect.sh"
-. "$(dirname "$0")/read-only.sh"
-work=$(mktemp -d) || exit 1
-trap 'rm -rf "$work"' EXIT
-trap 'exit 1' HUP INT TERM
+. "$(dirname "$0")/../scratch.sh"
 
 # try NAME OPTION...: configures in a folder of its own, quickly rather than well.
 try() {

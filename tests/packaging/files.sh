@@ -1,9 +1,6 @@
 # Tests what an installation from build folder $1 for prefix $2 contains, and that it works in place.
 . "$(dirname "$0")/../box/expect.sh"
-. "$(dirname "$0")/read-only.sh"
-work=$(mktemp -d) || exit 1
-trap 'rm -rf "$work"' EXIT
-trap 'exit 1' HUP INT TERM
+. "$(dirname "$0")/../scratch.sh"
 prefix=$work$2
 unit=$prefix/lib/systemd/system/kestrova-panel.service
 

@@ -1,10 +1,7 @@
 # Tests how the scripts react to wrong usage.
-. "$(dirname "$0")/../box/expect.sh"
-. "$(dirname "$0")/read-only.sh"
 cd "$(dirname "$(realpath "$0")")/../.." || exit 1
-work=$(mktemp -d) || exit 1
-trap 'rm -rf "$work"' EXIT
-trap 'exit 1' HUP INT TERM
+. tests/box/expect.sh
+. tests/scratch.sh
 
 # Without a temporary folder they print one line and end, because the next step could harm the host.
 for script in tests/box/box.sh tests/box/journey.sh \

@@ -1,10 +1,8 @@
 # The tests source this file. It makes a Debian of release $release below $root, which is removed
 # together with $work at the end; `in_system` runs commands in it.
 . "${here:?}/../../tools/bare-debian.sh"
-work=$(mktemp -d) || exit 1
+. "$here/../scratch.sh"
 root=$work/root
-trap 'rm -rf "$work"' EXIT
-trap 'exit 1' HUP INT TERM
 
 container="$nspawn --directory=$root"
 in_system() {
