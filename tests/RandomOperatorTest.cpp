@@ -127,8 +127,11 @@ Lines shortest(Lines journey) {
 TEST(RandomOperator, FindsNoScreenThatBreaksItsPromises) {
     // By hand, PANEL_SEEDS=FIRST-LAST plays others.
     unsigned first = 1, last = journeyCount;
-    if (const char *seeds = getenv("PANEL_SEEDS")) {
-        ASSERT_EQ(sscanf(seeds, "%u-%u", &first, &last), 2) << "PANEL_SEEDS=FIRST-LAST";
+    if (const std::string seeds = getenv("PANEL_SEEDS") ? getenv("PANEL_SEEDS") : "";
+        !seeds.empty()) {
+        ASSERT_EQ(sscanf(seeds.c_str(), "%u-%u", &first, &last), 2) << "PANEL_SEEDS=FIRST-LAST";
+        ASSERT_EQ(seeds, std::to_string(first) + "-" + std::to_string(last));
+        ASSERT_LE(first, last);
     }
     long long turns = 0;
     for (unsigned seed = first; seed <= last; ++seed) {

@@ -126,6 +126,9 @@ FRESH_TEST(Runtime, AFileIsReadLineByLineWhateverItHolds) {
               (Lines{std::string("a\0b", 3), std::string("\0", 1)}));
     EXPECT_EQ(linesOf(longLine + "\n" + longLine), (Lines{longLine, longLine}));
 
+    world().cutFiles = {path};
+    EXPECT_EQ(linesOf("a\nhalf a li"), Lines{"a"});
+    world().cutFiles.clear();
     world().directories = {path};
     EXPECT_TRUE(TextFile(path.c_str()).isOpen());
     EXPECT_EQ(linesOf("a\n"), Lines{});
@@ -133,7 +136,8 @@ FRESH_TEST(Runtime, AFileIsReadLineByLineWhateverItHolds) {
     world().appliance.act({"remove", path});
     EXPECT_FALSE(TextFile(path.c_str()).isOpen());
     EXPECT_EQ(TextFile(path.c_str()).nextLine(), std::nullopt);
-    EXPECT_NONFATAL_FAILURE(std::ifstream("/etc/resolv.conf"), "the machine's own file");
+    for (const char *other : {"/etc/resolv.conf", "/proc/sys/kernel/hostname"})
+        EXPECT_NONFATAL_FAILURE(std::ifstream file(other), "the machine's own file");
 }
 
 FRESH_TEST(Runtime, TrimmingStripsBothEnds) {

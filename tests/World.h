@@ -25,6 +25,7 @@ struct World {
     bool clockWorks = true;
     bool lineTakesBytes = true;
     std::set<std::string> directories; // in place of these files
+    std::set<std::string> cutFiles;    // behind whose contents reading fails
 
     emulator::Display display;
     emulator::Keypad keypad{[this](emulator::Key key) {
@@ -44,8 +45,8 @@ struct World {
 
     // What the program has done.
     struct Deed {
-        std::string what;   // a command, or how long a pause: "3000 ms"
-        std::string behind; // what the panel showed in the meantime
+        std::string what;          // a command, or how long a pause: "3000 ms"
+        emulator::Display display; // what the panel showed in the meantime
     };
     std::string sent;                // bytes written,
     std::vector<std::size_t> writes; // the length of each write,

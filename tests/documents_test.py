@@ -98,7 +98,8 @@ class Documents(unittest.TestCase):
                     if entry.is_file() and os.access(entry, os.X_OK)}
         for page, heading, there in (("README.md", "## All commands", commands),
                                      ("README.md", "## Folders", folders(".")),
-                                     ("docs/development.md", "## Folders", folders("src"))):
+                                     ("docs/development.md", "## Folders", folders("src")),
+                                     ("docs/development.md", "| `hostname` |", folders("emulator"))):
             with self.subTest(page=page, heading=heading):
                 self.assertEqual(table_under(heading, page), there)
 
