@@ -91,7 +91,7 @@ class Rack : public Surroundings {
             for (;; passage.turns++)
                 loop.turn();
         } catch (const ProgramEnds &) {
-        } catch (const std::runtime_error &error) {
+        } catch (const std::exception &error) {
             ADD_FAILURE() << error.what();
         }
         passage.appliance = w.appliance;
@@ -205,8 +205,8 @@ class Rack : public Surroundings {
         if (!passage.isInScene)
             return;
         EXPECT_EQ(w.runs.size(), runsExpected) << "also ran " << w.runs.back().what;
-        EXPECT_EQ(w.pauses.size(), pausesExpected)
-            << "also paused behind " << w.pauses.back().behind;
+        EXPECT_EQ(w.pauses.size(), pausesExpected) << "also paused behind\n"
+                                                   << Picture(w.pauses.back().display).text();
         EXPECT_EQ(w.display.hiddenCharacters() % hiddenByAWipe, 0U) << "only a wiped name's blanks";
     }
 
@@ -254,15 +254,14 @@ class Rack : public Surroundings {
 
     void awaitNext(const std::vector<World::Deed> &deeds, std::size_t &next,
                    const std::string &what, const Sight &sight) {
-        const std::string blank(Display::visibleColumns, ' ');
-        const std::string rows = sight.row0.value_or("") + "|" + sight.row1.value_or(blank);
-        isDone = [&deeds, &next, what, rows] {
+        isDone = [&deeds, &next, what, sight] {
             if (deeds.size() == next)
                 return false;
             const World::Deed &deed = deeds[next++];
-            if (deed.what != what || deed.behind != rows)
-                throw std::runtime_error("wanted: " + what + " behind " + rows + "\nit was: " +
-                                         deed.what + " behind " + deed.behind + "\n");
+            if (deed.what != what || !sight.isShownBy(deed.display))
+                throw std::runtime_error("wanted: " + what + " behind\n" + sight.text() +
+                                         "it was: " + deed.what + " behind\n" +
+                                         Picture(deed.display).text());
             return true;
         };
     }

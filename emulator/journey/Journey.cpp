@@ -1,6 +1,6 @@
 #include "emulator/journey/Journey.h"
 
-#include "emulator/panel/Font.h"
+#include "emulator/journey/words.h"
 
 #include <algorithm>
 #include <stdexcept>
@@ -12,7 +12,6 @@ namespace {
 
 constexpr std::size_t longestLine = 4096; // characters
 constexpr std::size_t mostSteps = 100'000;
-constexpr std::string_view blanks = " \t\r";
 
 std::string_view trimmed(std::string_view text) {
     text.remove_prefix(std::min(text.find_first_not_of(blanks), text.size()));
@@ -35,22 +34,26 @@ bool getLine(std::istream &input, std::string &line) {
 
 // The text of a step that fails is printed, and must not control the terminal.
 bool isText(std::string_view line) {
-    return std::all_of(line.begin(), line.end(), [](char c) {
-        return static_cast<unsigned char>(c) >= ' ' || blanks.find(c) != std::string_view::npos;
-    });
+    if (!line.empty() && line.back() == '\r')
+        line.remove_suffix(1); // some editors end lines with CR LF
+    return std::all_of(line.begin(), line.end(),
+                       [](char c) { return static_cast<unsigned char>(c) >= ' ' || c == '\t'; });
+}
+
+// Some editors begin a text with this, which nobody sees.
+void dropByteOrderMark(std::string &line) {
+    constexpr std::string_view mark = "\xEF\xBB\xBF";
+    if (line.compare(0, mark.size(), mark) == 0)
+        line.erase(0, mark.size());
 }
 
 bool isAboutTheKeypad(const Action &action) {
     return std::holds_alternative<step::Tap>(action) || std::holds_alternative<step::Keys>(action);
 }
 
-bool isScene(const Action &action) {
+const step::Scene *sceneOf(const Action &action) {
     const auto *inTest = std::get_if<TestAction>(&action);
-    return inTest != nullptr && std::holds_alternative<step::Scene>(*inTest);
-}
-
-bool beginsScene(const TextLine &line) {
-    return line.text.compare(0, 6, "scene ") == 0;
+    return inTest == nullptr ? nullptr : std::get_if<step::Scene>(inTest);
 }
 
 bool isSight(const TextLine &line) {
@@ -66,7 +69,7 @@ Journey::Journey(std::istream &input, std::string itsName, Stage itsStage)
     while (takeLine(input, line)) {
         if (line.text.empty() || line.text.front() == '#')
             continue;
-        if (stage == Stage::test && beginsScene(line))
+        if (stage == Stage::test && firstWord(line) == "scene")
             readScene(std::exchange(scene, {line}));
         else if (!scene.empty())
             scene.push_back(line);
@@ -85,8 +88,10 @@ bool Journey::takeLine(std::istream &input, TextLine &line) try {
     line.number++;
     std::string text;
     const bool isThere = getLine(input, text);
+    if (line.number == 1)
+        dropByteOrderMark(text);
     if (!isText(text))
-        throw std::invalid_argument("this is not text");
+        throw std::invalid_argument("this is not text: a control character is in it");
     line.text = trimmed(text);
     return isThere;
 } catch (const std::invalid_argument &error) {
@@ -94,7 +99,7 @@ bool Journey::takeLine(std::istream &input, TextLine &line) try {
 }
 
 void Journey::readScene(const std::vector<TextLine> &scene) {
-    for (const TextLine &line : expandTable(scene))
+    for (const TextLine &line : expandTable(scene, [this](int number) { return place(number); }))
         readLine(line);
 }
 
@@ -147,16 +152,22 @@ void Journey::addStep(const TextLine &line, const step::Choose &choice) {
 void Journey::addStep(const TextLine &line, const Action &action) {
     if (allSteps.size() == mostSteps)
         throw std::invalid_argument("there are too many steps");
-    // The one poll of a tap could not be told from those of the hold.
-    if (isScene(action))
+    if (const auto *scene = sceneOf(action)) {
+        sceneTitle = scene->title;
         isKeyDown = false;
+    }
+    // The one poll of a tap could not be told from those of the hold.
     if (isKeyDown && isAboutTheKeypad(action))
         throw std::invalid_argument("a key is still held: release it first");
     if (std::holds_alternative<step::Hold>(action))
         isKeyDown = true;
     if (std::holds_alternative<step::Release>(action))
         isKeyDown = false;
-    allSteps.push_back({line.number, line.text, action});
+    allSteps.push_back({line.number, line.text, sceneTitle, action});
+}
+
+std::string Journey::place(const Step &step) const {
+    return place(step.line) + (step.scene.empty() ? "" : "(" + step.scene + ") ");
 }
 
 std::string Journey::place(int line) const {

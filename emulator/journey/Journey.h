@@ -20,8 +20,8 @@ class Journey {
     Journey(std::istream &input, std::string name, Stage stage = Stage::panel);
 
     [[nodiscard]] const std::vector<Step> &steps() const { return allSteps; }
-    /// "NAME:LINE: ", to open a message about the step.
-    [[nodiscard]] std::string place(const Step &step) const { return place(step.line); }
+    /// "NAME:LINE: " and the title of the step's scene, to open a message about the step.
+    [[nodiscard]] std::string place(const Step &step) const;
 
   private:
     /// A walk or a hold, behind which its sights stand.
@@ -45,6 +45,7 @@ class Journey {
     std::string name;
     Stage stage;
     std::vector<Step> allSteps;
+    std::string sceneTitle; // of the steps that are being read
     bool isKeyDown = false; // at the end of the steps so far
     std::optional<Listing> listing;
 };

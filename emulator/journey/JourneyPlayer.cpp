@@ -63,8 +63,10 @@ bool JourneyPlayer::advance(TimePoint time) {
                 return false;
             }
         } catch (const std::runtime_error &error) {
-            throw std::runtime_error(journey.place(step) + step.text + "\n" + error.what() +
-                                     sightsBefore());
+            const std::string what =
+                error.what(); // a picture at its end has a line feed of its own
+            throw std::runtime_error(journey.place(step) + step.text + "\n" + what +
+                                     (what.back() == '\n' ? "" : "\n") + sightsBefore());
         }
         hasBegun = false;
         next++;
@@ -107,8 +109,7 @@ bool JourneyPlayer::play(const step::Tap &tap, bool begins) {
     if (tap.until && tap.until->isShownBy(panel.display))
         return true;
     if (tapsLeft == 0 && tap.until)
-        fail("after " + std::to_string(tap.count) +
-             " taps the panel still does not show what is expected\n" +
+        fail("after " + std::to_string(tap.count) + " taps, " +
              complaint(step::Expect{*tap.until}));
     if (tapsLeft == 0)
         return true;

@@ -7,9 +7,11 @@ namespace emulator {
 namespace {
 
 // In a list that scrolls, the last column tells that there is more above or below.
-bool isChosen(const std::string &row, const std::string &entry) {
+bool isChosen(std::string row, const std::string &entry) {
+    if (row.back() == '^' || row.back() == 'v')
+        row.back() = ' ';
     const std::size_t begin = row.find_first_not_of(' ', 1);
-    const std::size_t end = row.find_last_not_of(" ^v") + 1;
+    const std::size_t end = row.find_last_not_of(' ') + 1;
     return row.front() == '>' && begin < end && row.substr(begin, end - begin) == entry;
 }
 
@@ -30,7 +32,10 @@ bool Sight::isShownBy(const Display &display) const {
 std::string Sight::text() const {
     if (chosen)
         return "> " + *chosen + "\n";
-    return Picture({row0.value_or("(any)"), row1.value_or("(any)")}, cursor).text();
+    const Picture picture({row0.value_or("(any)"), row1.value_or("(any)")});
+    return picture.text() + (cursor ? "with the cursor at row " + std::to_string(cursor->row) +
+                                          ", column " + std::to_string(cursor->column) + "\n"
+                                    : "");
 }
 
 } // namespace emulator

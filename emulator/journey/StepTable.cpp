@@ -3,6 +3,7 @@
 #include "emulator/base/Number.h"
 #include "emulator/base/helpEntry.h"
 #include "emulator/journey/ApplianceVerbs.h"
+#include "emulator/journey/words.h"
 #include "emulator/panel/Display.h"
 #include "emulator/panel/Font.h"
 
@@ -15,46 +16,19 @@ namespace emulator {
 namespace {
 
 constexpr int mostPolls = 100'000;
-constexpr int mostRepeats = 255; // of a byte
-constexpr double mostSeconds = 86'400;
-constexpr std::string_view blanks = " \t\r";
+constexpr std::size_t longestWalk = 1000; // letters
+constexpr int mostRepeats = 255;          // of a byte
 
 [[noreturn]] void reject(const std::string &reason) {
     throw std::invalid_argument(reason);
 }
 
-struct Word {
-    std::string text;
-    bool isQuoted;
-};
-
-// Takes the quoted word off the front of `rest`, which begins with its quote.
-Word takeQuoted(std::string_view &rest) {
-    Word word{"", true};
-    for (std::size_t at = 1; at < rest.size(); at++) {
-        if (rest[at] == '"') {
-            rest.remove_prefix(at + 1);
-            return word;
-        }
-        if (rest[at] != '\\') {
-            word.text += rest[at];
-            continue;
-        }
-        at++;
-        if (at < rest.size() && std::string_view("\"\\n").find(rest[at]) == std::string_view::npos)
-            reject("in quotes, a backslash can only be followed by \", \\ or n");
-        if (at < rest.size())
-            word.text += rest[at] == 'n' ? '\n' : rest[at];
-    }
-    reject("a quote is not closed");
-}
-
 // What follows a step's name: words, which are taken one after the other, or the rest of the line.
 class Arguments {
   public:
-    explicit Arguments(std::string_view text) : rest(text) { skipBlanks(); }
+    explicit Arguments(std::string_view text) : rest(text) { skipBlanks(rest); }
 
-    bool isEmpty() const { return rest.empty() || rest.front() == '#'; }
+    bool isEmpty() const { return isEndOfWords(rest); }
     bool nextIs(std::string_view word) const {
         return std::string_view(rest).substr(0, rest.find_first_of(blanks)) == word;
     }
@@ -65,18 +39,7 @@ class Arguments {
     std::string take() {
         if (isEmpty())
             reject("");
-        Word word;
-        if (rest.front() == '"') {
-            word = takeQuoted(rest);
-        } else {
-            const std::size_t end = std::min(rest.find_first_of(blanks), rest.size());
-            word = {std::string(rest.substr(0, end)), false};
-            rest.remove_prefix(end);
-        }
-        if (!rest.empty() && blanks.find(rest.front()) == std::string_view::npos)
-            reject("there is no blank after a quoted word");
-        skipBlanks();
-        return word.text;
+        return unquoted(takeWord(rest));
     }
     void take(std::string_view word) {
         if (!nextIs(word))
@@ -88,8 +51,8 @@ class Arguments {
     int takeInteger(int least, int most, const std::string &what) {
         return parseNumber(take(), least, most, what);
     }
-    Clock::duration takeSeconds() {
-        return seconds(parseNumber(take(), 0.0, mostSeconds, "a number of seconds"));
+    Clock::duration takeSeconds(double least = 0) {
+        return seconds(parseNumber(take(), least, longestLimit, "a number of seconds"));
     }
     int takePolls() { return takeInteger(1, mostPolls, "a number of polls"); }
 
@@ -102,14 +65,31 @@ class Arguments {
         return found->key;
     }
 
+    // A text that can be seen on the panel, if there is any in it.
+    std::string takeVisible(std::size_t most) {
+        std::string text = take();
+        if (text.size() > most)
+            reject("\"" + text + "\" is longer than a row");
+        if (!std::all_of(text.begin(), text.end(), isPrintable))
+            reject("\"" + text + "\" can never be seen: the panel shows only printable ASCII");
+        return text;
+    }
     std::string takeRow() {
-        std::string row = take();
-        if (row.size() > Display::visibleColumns)
-            reject("\"" + row + "\" is longer than a row");
-        if (!std::all_of(row.begin(), row.end(), isPrintable))
-            reject("\"" + row + "\" can never be seen: the panel shows only printable ASCII");
+        std::string row = takeVisible(Display::visibleColumns);
         row.resize(Display::visibleColumns, ' ');
         return row;
+    }
+    std::string takeEntry() {
+        const std::string entry = takeVisible(Display::visibleColumns - 1); // behind the marker
+        if (entry.empty())
+            reject("an entry of a list is not empty");
+        return entry;
+    }
+    std::string takeLetters() {
+        const std::string letters = takeVisible(longestWalk);
+        if (letters.empty())
+            reject("there are no letters to walk through");
+        return letters;
     }
     Display::Place takePlace() {
         const int row = takeInteger(0, Display::rowCount - 1, "a row");
@@ -119,13 +99,16 @@ class Arguments {
         Sight sight;
         if (nextIs("chosen")) {
             take();
-            sight.chosen = take();
+            sight.chosen = takeEntry();
             return sight;
         }
-        if (nextIs("*"))
+        if (nextIs("*")) {
             take();
-        else
+            if (isEmpty())
+                reject("* alone is always seen: give the other row, or where the cursor is");
+        } else {
             sight.row0 = takeRow();
+        }
         if (!isEmpty() && !nextIs("at"))
             sight.row1 = takeRow();
         if (!isEmpty()) {
@@ -151,8 +134,6 @@ class Arguments {
     }
 
   private:
-    void skipBlanks() { rest.remove_prefix(std::min(rest.find_first_not_of(blanks), rest.size())); }
-
     std::string_view rest;
 };
 
@@ -205,15 +186,15 @@ ParsedStep parseHold(Arguments &words) {
 
 ParsedStep parseWalk(Arguments &words) {
     const Key key = words.takeKey();
-    return step::Walk{key, false, words.isEmpty() ? "" : words.take()};
+    return step::Walk{key, false, words.isEmpty() ? "" : words.takeLetters()};
 }
 
 ParsedStep parseChoose(Arguments &words) {
-    return step::Choose{words.take()};
+    return step::Choose{words.takeEntry()};
 }
 
 ParsedStep parseWith(Arguments &) {
-    reject("a table stands in a scene");
+    reject("a table stands in a scene, behind its title");
 }
 
 ParsedStep parseRelease(Arguments &) {
@@ -252,7 +233,7 @@ ParsedStep parseSay(Arguments &words) {
 }
 
 ParsedStep parseLimit(Arguments &words) {
-    return step::Limit{words.takeSeconds()};
+    return step::Limit{words.takeSeconds(shortestLimit)};
 }
 
 ParsedStep parseRun(Arguments &words) {
@@ -417,16 +398,6 @@ std::string stepsHelp(Stage stage) {
             text += helpEntry("  " + usage(kind), kind.help, indent);
     }
     return text + (stage == Stage::panel ? "The appliance's verbs are:\n" + verbsHelp() : "");
-}
-
-std::string quoted(std::string_view text) {
-    std::string word = "\"";
-    for (const char c : text) {
-        if (c == '"' || c == '\\')
-            word += '\\';
-        word += c == '\n' ? "\\n" : std::string(1, c);
-    }
-    return word + "\"";
 }
 
 } // namespace emulator

@@ -9,6 +9,9 @@
 
 namespace emulator {
 
+constexpr double shortestLimit = 0.001; ///< seconds that a step may wait for the panel
+constexpr double longestLimit = 86'400; ///< a day
+
 /// Where a journey is to be played.
 enum class Stage {
     panel, ///< on an emulated panel, beside a program that runs in real time
@@ -24,8 +27,5 @@ ParsedStep parseStep(std::string_view line, Stage stage);
 /// The usage of each step and what it does, for `--help`: of those that can be played anywhere or,
 /// for Stage::test, of those that only a test adds.
 std::string stepsHelp(Stage stage);
-
-/// The word as it has to stand in a journey to be read as `text`: in quotes, with \", \\ and \n.
-std::string quoted(std::string_view text);
 
 } // namespace emulator

@@ -141,8 +141,9 @@ using Action = std::variant<step::Tap, step::Keys, step::Hold, step::Release, st
                             step::Say, step::Limit, step::Run, step::Appliance, TestAction>;
 
 struct Step {
-    int line;         ///< of the journey's text, from 1
-    std::string text; ///< of that line, with the values of the scene's table in it
+    int line;          ///< of the journey's text, from 1
+    std::string text;  ///< of that line, with the values of the scene's table in it
+    std::string scene; ///< its title, with these values, too
     Action action;
 };
 

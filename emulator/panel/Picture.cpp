@@ -71,8 +71,7 @@ Picture::Picture(const Display &display) : cursor(display.visibleCursor()) {
         rows.at(static_cast<std::size_t>(row)) = display.visibleRow(row);
 }
 
-Picture::Picture(const Rows &itsRows, std::optional<Display::Place> itsCursor)
-    : rows(itsRows), cursor(itsCursor) {
+Picture::Picture(const Rows &itsRows) : rows(itsRows) {
     for (std::string &row : rows)
         row.resize(Display::visibleColumns, ' ');
 }

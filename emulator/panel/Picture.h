@@ -15,8 +15,8 @@ class Picture {
     using Rows = std::array<std::string, Display::rowCount>;
 
     explicit Picture(const Display &display);
-    /// A picture of two rows of text, padded or cut to 16 columns, with a cursor if it has a place.
-    explicit Picture(const Rows &itsRows, std::optional<Display::Place> itsCursor = std::nullopt);
+    /// A picture of two rows of text, padded or cut to 16 columns, without a cursor.
+    explicit Picture(const Rows &itsRows);
 
     /// A frame of four lines. A blinking cursor is marked at its column in the border next to its
     /// row; bytes that are not printable ASCII show as question marks.

@@ -132,7 +132,7 @@ TEST(Journey, RefusesWrongStepsWithTheirLine) {
     EXPECT_EQ(refusal([] { parse(" \n# nothing\n"); }), "trip: there is no step in it");
     EXPECT_EQ(refusal([] { parse("walk up\n\nrelease\n"); }),
               "trip:1: no sights stand behind this step");
-    parse("say " + std::string(4092, '.'));
+    parse("\xEF\xBB\xBFsay a\r\nsay " + std::string(4092, '.'));
     EXPECT_EQ(refusal([] { parse("say a\nsay " + std::string(4093, '.')); }),
               "trip:2: the line is too long");
 }
@@ -179,6 +179,27 @@ TEST(JourneyPlayer, WaitsForWhatIsExpectedUpToTheLimit) {
     const std::string message = refusal([&] { trip.player.advance(trip.now); });
     EXPECT_EQ(message.substr(0, 8), "trip:4: ");
     EXPECT_LT(message.find("|gone            |"), message.find("|say \"\\          |")) << message;
+}
+
+TEST(Sight, IsShownOrNotAndTellsWhatWasWanted) {
+    const std::vector<std::tuple<std::string, std::string, bool>> cases{
+        {"> Set Srv", "chosen \"Set Srv\"", true},
+        {"> Set Srv", "chosen \"Set Sr\"", false},
+        {"^A^\x10> Set Entry 13 v"s, "chosen \"Set Entry 13\"", true},
+        {"go^\r"s, "\"go\" at 0 2", true},
+        {"go^\f"s, "\"go\" at 0 2", false},
+        {"go^\r"s, "* \"\" at 0 39", false},
+    };
+    for (const auto &[bytes, sight, isShown] : cases) {
+        Trip trip("expect " + sight);
+        trip.display = showing(bytes);
+        trip.keypad.request(true);
+        EXPECT_EQ(trip.player.advance(trip.now), isShown) << sight;
+        const std::string message =
+            refusal([&] { trip.player.advance(trip.now + std::chrono::seconds(1)); });
+        EXPECT_EQ(message.find("wanted:\n") == std::string::npos, isShown) << message;
+        EXPECT_EQ(message.find("the last that the panel showed") == std::string::npos, isShown);
+    }
 }
 
 } // namespace
