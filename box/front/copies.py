@@ -1,58 +1,68 @@
 """The host's files that are copied into the box."""
 
+import io
 import os
 import re
 import stat
+import tarfile
+import time
 
-from front.ending import NO_COMMAND, end_with, no_box
+from front.ending import NO_COMMAND, NO_RUN, end_with, no_box
 
 HOST_NAME_MAX = 64
 
 
-class Copies:
-    """Arguments that make bubblewrap copy files into the box from descriptors that are opened here."""
+class Archive:
+    """What is copied into the box, as a tar archive in memory. There may be any number of files."""
 
     def __init__(self):
-        self.arguments = []
+        self.descriptor = os.memfd_create("box")
+        self.tar = tarfile.open(fileobj=os.fdopen(os.dup(self.descriptor), "wb"), mode="w",
+                                encoding="utf-8", errors="surrogateescape")
 
-    def add(self, descriptor, destination, mode=0o644):
-        os.set_inheritable(descriptor, True)
-        self.arguments += ["--perms", f"{mode:04o}", "--file", str(descriptor), destination]
+    def finish(self):
+        """Returns the descriptor of the archive, which is to be read from its beginning."""
+        self.tar.close()
+        self.tar.fileobj.close()
+        os.lseek(self.descriptor, 0, os.SEEK_SET)
+        return self.descriptor
 
-    def add_file(self, path, destination):
-        descriptor = os.open(path, os.O_RDONLY | os.O_NONBLOCK)
-        mode = os.fstat(descriptor).st_mode
-        if not stat.S_ISREG(mode):
-            no_box(f"{path} is not a regular file")
-        # The root of the box copies it again, and may not read a file that nobody may read.
-        self.add(descriptor, destination, stat.S_IMODE(mode) & 0o777 | 0o400)
+    def add(self, name, kind, mode, size=0, content=None, target=""):
+        entry = tarfile.TarInfo(name)
+        entry.type, entry.mode, entry.size, entry.linkname = kind, mode, size, target
+        entry.mtime = int(time.time())
+        self.tar.addfile(entry, content)
 
-    def add_text(self, text, destination):
-        self.add(memory_file(text), destination)
+    def add_text(self, text, name):
+        content = os.fsencode(text)
+        self.add(name, tarfile.REGTYPE, 0o644, len(content), io.BytesIO(content))
 
-    def add_tree(self, path, destination):
-        self.arguments += ["--dir", destination]
+    def add_file(self, path, name):
+        with open(os.open(path, os.O_RDONLY | os.O_NONBLOCK), "rb") as file:
+            status = os.fstat(file.fileno())
+            if not stat.S_ISREG(status.st_mode):
+                no_box(f"{path} is not a regular file")
+            # The root of the box copies it again, and may not read a file that nobody may read.
+            mode = stat.S_IMODE(status.st_mode) & 0o777 | 0o400
+            self.add(name, tarfile.REGTYPE, mode, status.st_size, file)
+
+    def add_tree(self, path, name):
+        self.add(name, tarfile.DIRTYPE, 0o755)
         for entry in sorted(os.scandir(path), key=lambda entry: entry.name):
-            inside = f"{destination}/{entry.name}"
+            inside = f"{name}/{entry.name}"
             if entry.is_symlink():
-                self.arguments += ["--symlink", os.readlink(entry.path), inside]
+                self.add(inside, tarfile.SYMTYPE, 0o777, target=os.readlink(entry.path))
             elif entry.is_dir():
                 self.add_tree(entry.path, inside)
             else:
                 self.add_file(entry.path, inside)
 
 
-def memory_file(text):
-    descriptor = os.memfd_create("box")
-    with open(os.dup(descriptor), "wb") as writer:
-        writer.write(os.fsencode(text))
-    os.lseek(descriptor, 0, os.SEEK_SET)
-    return descriptor
-
-
 def open_command(command):
     """Returns descriptor, path and mode of a command that would not be seen in the box otherwise."""
     seen = ("/usr/", "/bin/", "/sbin/", "/opt/kestrova/", "/run/box/")
+    if command == "":
+        end_with(NO_COMMAND, "the command is empty")
     if "/" not in command or command.startswith(seen):
         return None
     try:
@@ -61,7 +71,7 @@ def open_command(command):
         end_with(NO_COMMAND, f"{command} does not exist")
     mode = os.fstat(descriptor).st_mode
     if not stat.S_ISREG(mode):
-        end_with(NO_COMMAND, f"{command} is not a regular file")
+        end_with(NO_RUN, f"{command} cannot be run: it is not a regular file")
     return descriptor, os.path.abspath(command), stat.S_IMODE(mode) & 0o777
 
 

@@ -3,7 +3,7 @@
 import os
 import sys
 
-WRONG_USAGE, NO_BOX, NO_COMMAND = 2, 125, 127
+WRONG_USAGE, NO_BOX, NO_RUN, NO_COMMAND = 2, 125, 126, 127
 
 
 def end_with(status, message):

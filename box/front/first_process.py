@@ -5,7 +5,6 @@ import os
 import select
 import signal
 
-from front.copies import memory_file
 from front.ending import NO_BOX, no_box
 from front.namespaces import libc, unshare
 from front.places import CHECKOUT, INSIDE_PATH
@@ -14,10 +13,15 @@ from front.tools import exec_tool
 # The host's tools look things up in these entries of /etc. The appliance's files are added to them.
 HOST_ETC = ("alternatives", "ld.so.cache", "passwd", "group", "nsswitch.conf", "localtime")
 CAPABILITIES = ("CAP_NET_ADMIN", "CAP_SYS_ADMIN", "CAP_NET_RAW", "CAP_NET_BIND_SERVICE")
+ARCHIVE = "/run/box/archive.tar"
+UNPACK_AND_BEGIN = f"""\
+tar -xf {ARCHIVE} -C /run/box && rm {ARCHIVE} || exit {NO_BOX}
+exec /run/box/inside/init "$@"
+"""
 PR_SET_PDEATHSIG = 1
 
 
-def bubblewrap_arguments(options, copies, command):
+def bubblewrap_arguments(options, archive, command):
     """Decides what is seen in the box. To be called in the user namespace."""
     arguments = [
         "--unshare-pid", "--cap-drop", "ALL", *(word for name in CAPABILITIES for word in ("--cap-add", name)),
@@ -40,14 +44,19 @@ def bubblewrap_arguments(options, copies, command):
     for name in HOST_ETC:
         if not os.path.lexists(f"{options.appliance}/etc/{name}"):
             arguments += ["--ro-bind-try", f"/etc/{name}", f"/etc/{name}"]
+    arguments += ["--dir", "/run/box"]
     if options.tty:
         arguments += ["--dev-bind", options.tty, "/dev/ttyS1"]
+    copies = [(archive, ARCHIVE, 0o600)]
     if command and not command[1].startswith(shown):
-        copies.add(*command)
-    return arguments + copies.arguments
+        copies.append(command)
+    for descriptor, destination, mode in copies:
+        os.set_inheritable(descriptor, True)
+        arguments += ["--perms", f"{mode:04o}", "--file", str(descriptor), destination]
+    return arguments
 
 
-def become_first_process(options, copies, command, command_file, asker, front_lives, report):
+def become_first_process(options, archive, command, command_file, asker, front_lives, report):
     """Runs as the first process of the box's PID namespace, and never returns."""
     libc.prctl(PR_SET_PDEATHSIG, signal.SIGKILL)
     # The front may have ended before that took effect.
@@ -62,10 +71,12 @@ def become_first_process(options, copies, command, command_file, asker, front_li
         no_box(f"a new /proc is refused here ({os.strerror(ctypes.get_errno())}): "
                "the surrounding container hides parts of its own")
     os.set_inheritable(report, True)
-    words = bubblewrap_arguments(options, copies, command_file)
-    listing = memory_file("".join(f"{word}\0" for word in words))
+    words = bubblewrap_arguments(options, archive, command_file)
+    listing = os.memfd_create("arguments")
+    os.write(listing, b"".join(os.fsencode(word) + b"\0" for word in words))
+    os.lseek(listing, 0, os.SEEK_SET)
     os.set_inheritable(listing, True)
     if command_file:
         command = [command_file[1], *command[1:]]
     exec_tool("bwrap", "--json-status-fd", str(report), "--args", str(listing), "--",
-              "/run/box/inside/init", *command)
+              "/bin/sh", "-c", UNPACK_AND_BEGIN, "sh", *command)

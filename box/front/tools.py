@@ -8,7 +8,7 @@ from front.places import INSIDE_PATH
 
 TOOLS = {
     "bwrap": "bubblewrap", "ip": "iproute2", "ifconfig": "net-tools", "hostname": "hostname",
-    "udhcpc": "udhcpc", "udhcpd": "udhcpd", "nsenter": "util-linux",
+    "udhcpc": "udhcpc", "udhcpd": "udhcpd", "nsenter": "util-linux", "tar": "tar",
 }
 
 

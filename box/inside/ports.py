@@ -11,10 +11,16 @@ import sys
 INTERFACE_NAME_MAX = 15
 
 
-
 def far_end(name):
     """The name of the veth's far end. It contains a "v", so that the program leaves it out of its list."""
     return None if name.startswith("bridge") else f"v-{name}"
+
+
+def check_name(name):
+    if not re.fullmatch("[A-Za-z0-9][A-Za-z0-9_.-]*", name):
+        raise ValueError(f"'{name}' is not a name for a port")
+    if len(name) > INTERFACE_NAME_MAX:
+        raise ValueError(f"the name '{name}' has more than {INTERFACE_NAME_MAX} characters")
 
 
 def commands_to_make(name):
@@ -67,10 +73,7 @@ class Ports:
         self.serve(name, far, server)
 
     def claim(self, name):
-        if not re.fullmatch("[A-Za-z0-9][A-Za-z0-9_.-]*", name):
-            raise ValueError(f"'{name}' is not a name for a port")
-        if len(name) > INTERFACE_NAME_MAX:
-            raise ValueError(f"the name '{name}' has more than {INTERFACE_NAME_MAX} characters")
+        check_name(name)
         if name in self.names:
             raise ValueError(f"there already is a port {name}")
         self.names.add(name)
@@ -108,4 +111,9 @@ def checked_interface(text):
 
 
 if __name__ == "__main__":
+    try:
+        for each in filter(None, (sys.argv[1], far_end(sys.argv[1]))):
+            check_name(each)
+    except ValueError as fault:
+        sys.exit(f"appliance: {fault}")
     print(*commands_to_make(sys.argv[1]), sep="\n")

@@ -59,6 +59,7 @@ expect "DHCP clients" 1 "$(pidof udhcpc | wc -w)"
 expect "back to static" 0 "$(apply iface --name eth1 --ipaddress 10.1.1.1 --netmask 255.0.0.0)"
 expect "lease given up" "10.1.1.1/8 0" "$(address eth1) $(pidof udhcpc | wc -w)"
 
+expect "a file that is missing" 1 "$(appliance has file /etc/none x 2>&1 | wc -l)"
 echo chatters >/run/box/script-mode
 expect "chatter" "Reloading the network configuration 0" "$(set_eth0 | xargs)"
 echo hangs 60 >/run/box/script-mode

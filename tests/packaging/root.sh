@@ -38,6 +38,7 @@ play() {
 }
 # A system that reboots ends with this status.
 end_with_reboot() {
+    timeout 900 tail -f --pid=$manager /dev/null || { cat "$root/root/played"; give_up "to end"; }
     wait $manager
     [ $? -eq 133 ] || { cat "$root/root/played"; give_up "to come to the reboot"; }
 }
@@ -75,9 +76,10 @@ chmod +x "$root/root/example" "$root/root/stand-in" "$root$gate"/*
     done <<'TEXT'
 The service is restarted|systemctl restart kestrova-panel|true
 The service is stopped|systemctl stop kestrova-panel|systemctl start kestrova-panel
-The package is upgraded|dpkg -i /root/kestrova-panel_*|true
+The package is installed again|dpkg -i /root/kestrova-panel_*|true
 The package is removed|dpkg -r kestrova-panel \&\& ! pidof kestrova-panel|dpkg -i /root/kestrova-panel_*
 The program crashes|pkill -SEGV -x kestrova-panel|true
+The program is killed|pkill -KILL -x kestrova-panel|true
 The panel is unplugged|/root/line unplug|/root/line plug
 TEXT
     cat "$here/again.journey" "$here/reboot.journey"
