@@ -57,7 +57,34 @@ template <typename Step> auto WebSession::then(Step step) {
 
 void WebSession::start() {
     socket.next_layer().expires_after(requestTime);
-    http::async_read(socket.next_layer(), received, parser, then(&WebSession::answerRequest));
+    http::async_read(
+        socket.next_layer(), received, parser,
+        loop.turnAfter([self = shared_from_this()](const error_code &error, std::size_t) {
+            if (error == http::error::header_limit)
+                self->refuseHeader();
+            else if (error)
+                self->close();
+            else if (!self->isClosed)
+                self->answerRequest();
+        }));
+}
+
+void WebSession::refuseHeader() {
+    isTooLong = true;
+    respond(http::status::request_header_fields_too_large,
+            {"text/plain; charset=utf-8",
+             "The browser has sent a header of more than " + std::to_string(mostHeaderBytes) +
+                 " bytes. Cookies of other servers at this address may be the cause: delete them, "
+                 "or open the page in a private window.\n"});
+}
+
+// Closed at once, the connection would be reset, and the answer lost with what has not been read.
+void WebSession::passOverRest() {
+    error_code ignored;
+    socket.next_layer().socket().shutdown(asio::socket_base::shutdown_send, ignored);
+    received.clear();
+    socket.next_layer().async_read_some(received.prepare(mostHeaderBytes),
+                                        then(&WebSession::passOverRest));
 }
 
 void WebSession::answerRequest() {
@@ -98,7 +125,8 @@ void WebSession::respond(http::status status, WebService::Resource resource) {
     response.body() = std::move(resource.body);
     response.prepare_payload();
     socket.next_layer().expires_after(answerTime);
-    http::async_write(socket.next_layer(), response, then(&WebSession::close));
+    http::async_write(socket.next_layer(), response,
+                      then(isTooLong ? &WebSession::passOverRest : &WebSession::close));
 }
 
 void WebSession::openPage() {

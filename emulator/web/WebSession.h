@@ -47,6 +47,8 @@ class WebSession : public std::enable_shared_from_this<WebSession> {
     using Response = boost::beast::http::response<boost::beast::http::string_body>;
 
     template <typename Step> auto then(Step step);
+    void refuseHeader();
+    void passOverRest();
     void answerRequest();
     void respond(boost::beast::http::status status, WebService::Resource resource = {});
     void openPage();
@@ -68,7 +70,8 @@ class WebSession : public std::enable_shared_from_this<WebSession> {
     Text next;    // to be written
     Text current; // being written
     TimePoint countedSince;
-    int messages = 0; // since then
+    int messages = 0;       // since then
+    bool isTooLong = false; // the request
     bool hasOpened = false;
     bool isLeaving = false;
     bool isClosed = false;

@@ -69,6 +69,8 @@ class Limits(unittest.TestCase):
         self.assert_well()  # so all of them have been accepted
         self.assertLess(len(os.listdir(f"/proc/{self.panel.process.pid}/fd")), 64)
         words = ("press", "press north", "release now", "", "press up" + " " * 2**20)
+        status, _, body = self.panel.ask(self.panel.path, Cookie="x" * 30_000)
+        self.assertEqual((status, b"Cookies" in body), (431, True))
         for bad in (b"\xff" * 62, b"\x81\x05press", chance.randbytes(100),
                     *(websocket.ABNF.create_frame(text, 1).format() for text in words)):
             page = self.panel.open()
