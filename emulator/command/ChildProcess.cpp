@@ -1,6 +1,9 @@
 #include "emulator/command/ChildProcess.h"
 
+#include "emulator/base/complain.h"
+
 #include <fcntl.h>
+#include <poll.h>
 #include <sys/prctl.h>
 #include <sys/syscall.h>
 #include <sys/wait.h>
@@ -10,6 +13,7 @@
 #include <csignal>
 #include <cstring>
 #include <ctime>
+#include <fstream>
 #include <system_error>
 
 namespace emulator {
@@ -45,14 +49,27 @@ void endWith(pid_t parent) {
         argv.push_back(word.data());
     argv.push_back(nullptr);
     execvp(argv[0], argv.data());
-    dprintf(STDERR_FILENO, "panel-emulator: cannot run %s: %s\n", argv[0], strerror(errno));
+    complain("cannot run " + command.front() + ": " + strerror(errno));
     _exit(cannotRun);
 }
 
-// Waits until the command and its group have ended, and ends them at SIGTERM as far as possible: a
-// process that has become root cannot be killed, and a zombie whose parent has left the group
-// stays.
-int waitForGroup(pid_t command, const sigset_t &awaited) {
+FileDescriptor openProcess(pid_t pid) {
+    // By its number, because the C library's header for it cannot be used in C++.
+    return FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, pid, 0)));
+}
+
+// Sends a signal to the command's group and to this process's children. What has left the group
+// becomes one of them when its parent ends.
+void signalAll(pid_t command, int number) {
+    kill(-command, number);
+    std::ifstream children("/proc/thread-self/children");
+    for (pid_t child = 0; children >> child;)
+        kill(child, number);
+}
+
+// Waits until the command and whatever it has started have ended, and ends them at SIGTERM as far
+// as possible: a process that has become root cannot be killed.
+int waitForAll(pid_t command, const sigset_t &awaited) {
     std::optional<int> status;
     std::optional<TimePoint> giveUp;
     for (;;) {
@@ -63,14 +80,14 @@ int waitForGroup(pid_t command, const sigset_t &awaited) {
         while ((ended = waitpid(-1, &raw, WNOHANG)) > 0)
             if (ended == command)
                 status = shellStatus(raw);
-        const bool empty = kill(-command, 0) != 0;
-        if (status && empty)
+        const bool isNoneLeft = ended < 0; // no child, not even an adopted one
+        if (status && isNoneLeft)
             return *status;
         if (!giveUp && (signal == SIGTERM || status)) {
-            kill(-command, SIGTERM);
+            signalAll(command, SIGTERM);
             giveUp = Clock::now() + gracePeriod;
         } else if (giveUp && Clock::now() >= *giveUp) {
-            kill(-command, SIGKILL);
+            signalAll(command, SIGKILL);
         }
         if (giveUp && Clock::now() >= *giveUp + killPeriod)
             kill(getpid(), SIGKILL); // which tells the emulator
@@ -90,7 +107,7 @@ int waitForGroup(pid_t command, const sigset_t &awaited) {
         signal(number, SIG_DFL);
     endWith(parent);
     setsid(); // a background group of the terminal would be stopped when it reads or writes there
-    prctl(PR_SET_CHILD_SUBREAPER, 1); // so that orphans of the group do not linger as zombies
+    prctl(PR_SET_CHILD_SUBREAPER, 1); // so that orphans become children of this process
     dup2(open("/dev/null", O_RDONLY | O_CLOEXEC), STDIN_FILENO);
     if (output >= 0) {
         dup2(output, STDOUT_FILENO);
@@ -110,7 +127,7 @@ int waitForGroup(pid_t command, const sigset_t &awaited) {
     sigemptyset(&awaited);
     sigaddset(&awaited, SIGCHLD);
     sigaddset(&awaited, SIGTERM);
-    _exit(waitForGroup(pid, awaited));
+    _exit(waitForAll(pid, awaited));
 }
 
 } // namespace
@@ -129,8 +146,8 @@ ChildProcess::ChildProcess(Loop &loop, std::vector<std::string> words, int outpu
     if (guard < 0 || read(pidReport.get(), &command, sizeof command) != sizeof command ||
         command < 0)
         throw std::system_error(errno, std::generic_category(), "cannot start a process");
-    // By its number, because the C library's header for it cannot be used in C++.
-    guardEnd = FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, guard, 0)));
+    commandEnd = openProcess(command);
+    guardEnd = openProcess(guard);
     guardEndWait = std::make_unique<Readable>(loop, guardEnd.get(), [this] { status(); });
 }
 
@@ -147,10 +164,19 @@ std::optional<int> ChildProcess::status() {
     int raw = 0;
     if (!result && waitpid(guard, &raw, WNOHANG) == guard) {
         result = shellStatus(raw);
-        hasGuardGivenUp = WIFSIGNALED(raw);
         guardEndWait.reset();
+        if (WIFSIGNALED(raw))
+            endWithoutGuard();
     }
     return result;
+}
+
+// The guard has given up, or somebody has killed it.
+void ChildProcess::endWithoutGuard() {
+    kill(-command, SIGKILL);
+    pollfd end{commandEnd.get(), POLLIN, 0};
+    isCommandLeft =
+        poll(&end, 1, static_cast<int>(std::chrono::milliseconds(killPeriod).count())) == 0;
 }
 
 } // namespace emulator

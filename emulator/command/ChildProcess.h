@@ -18,8 +18,8 @@ namespace emulator {
 /// unseen.
 ///
 /// A guard process stands between the two. It outlives a killed emulator for as long as it takes
-/// to end the command and what the command left in its group: SIGTERM, SIGKILL 2 s later, and
-/// another second later it gives up on what cannot be killed.
+/// to end the command and whatever the command has started: SIGTERM, SIGKILL 2 s later, and another
+/// second later it gives up on what cannot be killed.
 class ChildProcess {
   public:
     /// Starts the command, found along PATH, with standard input empty. Its standard output and
@@ -39,17 +39,18 @@ class ChildProcess {
     /// The command's exit status, 128 + signal if it was killed, nothing while it or what it has
     /// started is running.
     std::optional<int> status();
-    /// True when there is a status only because the guard has given up: the command is still
-    /// running.
-    [[nodiscard]] bool isLeftRunning() const { return hasGuardGivenUp; }
+    /// True when there is a status only because the guard has gone: the command is still running.
+    [[nodiscard]] bool isLeftRunning() const { return isCommandLeft; }
 
   private:
+    void endWithoutGuard();
+
     pid_t guard = -1;
     pid_t command = -1;
-    FileDescriptor guardEnd; // readable when the guard has ended
+    FileDescriptor commandEnd, guardEnd; // readable when that process has ended
     std::unique_ptr<Readable> guardEndWait;
     std::optional<int> result;
-    bool hasGuardGivenUp = false;
+    bool isCommandLeft = false;
 };
 
 } // namespace emulator
