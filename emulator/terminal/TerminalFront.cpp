@@ -8,14 +8,10 @@
 
 #include <algorithm>
 #include <cerrno>
-#include <clocale>
 #include <cstdio>
 #include <fcntl.h>
-#include <poll.h>
 #include <stdexcept>
 #include <string>
-#include <sys/ioctl.h>
-#include <termios.h>
 #include <unistd.h>
 
 namespace emulator {
@@ -39,6 +35,7 @@ constexpr Cell glassSize{Display::rowCount + 2, Display::visibleColumns + 2};
 constexpr int lineAt = 7;
 constexpr int countsAt = 8;
 constexpr int helpAt = 10;
+constexpr int wordAt = 11;
 
 constexpr const char *mouseOn = "\033[?1000h\033[?1006h";
 constexpr const char *mouseOff = "\033[?1006l\033[?1000l";
@@ -83,53 +80,23 @@ FileDescriptor openKeyboard() {
     return keyboard;
 }
 
-// Ctrl-S has no meaning here, because a stopped terminal would stop the panel.
-void ignoreFlowControl() {
-    termios settings{};
-    tcgetattr(STDIN_FILENO, &settings);
-    settings.c_iflag &= ~static_cast<tcflag_t>(IXON);
-    tcsetattr(STDIN_FILENO, TCSANOW, &settings);
-    def_prog_mode();
-}
-
-// A terminal that nobody reads takes nothing more, and writing to it would wait.
-bool isWritable() {
-    pollfd terminal{STDOUT_FILENO, POLLOUT, 0};
-    return poll(&terminal, 1, 0) == 1 && (terminal.revents & POLLOUT) != 0;
-}
-
-void send(const char *sequence) {
-    std::fputs(sequence, stdout);
-    std::fflush(stdout);
-}
-
 } // namespace
 
 TerminalFront::TerminalFront(Loop &loop, const Display &itsDisplay, Keypad &itsKeypad, Use itsUse)
     : keyboard(openKeyboard()), display(itsDisplay), keypad(itsKeypad), use(itsUse),
       input(loop, keyboard.get(), [this] { readInput(); }), finger(itsKeypad), load(Clock::now()) {
-    std::setlocale(LC_ALL, "");
-    initscr();
-    cbreak();
-    noecho();
-    nonl();
-    ignoreFlowControl();
-    curs_set(0);
     if (has_colors()) {
         start_color();
         use_default_colors();
         init_pair(glassColours, COLOR_BLACK, COLOR_GREEN);
     }
     if (use == Use::operate)
-        send(mouseOn);
+        screen.send(mouseOn);
 }
 
 TerminalFront::~TerminalFront() {
-    if (!isWritable())
-        tcflush(STDOUT_FILENO, TCOFLUSH); // what nobody reads would delay the end
     if (use == Use::operate)
-        send(mouseOff);
-    endwin();
+        screen.send(mouseOff);
 }
 
 std::optional<int> TerminalFront::look(TimePoint now) {
@@ -152,9 +119,7 @@ std::optional<TimePoint> TerminalFront::wakeAt() const {
 }
 
 void TerminalFront::resize() {
-    winsize size{};
-    if (ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_row > 0 && size.ws_col > 0)
-        resizeterm(size.ws_row, size.ws_col);
+    screen.resize();
     drawAgain = {};
 }
 
@@ -211,17 +176,18 @@ void TerminalFront::act(const TerminalKeys::Other &, TimePoint) {
 
 void TerminalFront::stopWith(const std::function<void()> &stop) {
     if (use == Use::operate)
-        send(mouseOff);
-    endwin();
+        screen.send(mouseOff);
+    screen.leave();
     stop();
+    screen.enter();
     if (use == Use::operate)
-        send(mouseOn);
+        screen.send(mouseOn);
     drawAgain = {};
 }
 
 void TerminalFront::draw(TimePoint now) {
     drawAgain = now + frameTime;
-    if (!isWritable())
+    if (!screen.isReady())
         return;
     erase();
     attrset(A_NORMAL);
@@ -233,7 +199,8 @@ void TerminalFront::draw(TimePoint now) {
     put({helpAt, panelAt.x},
         use == Use::operate ? "arrows, Enter, Escape: tap   with Shift, or u d e x: hold   q: quit"
                             : "a journey is being played   q: quit");
-    refresh();
+    put({wordAt, panelAt.x}, word);
+    screen.refresh();
 }
 
 void TerminalFront::drawGlass(TimePoint now) const {

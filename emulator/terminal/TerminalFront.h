@@ -9,9 +9,11 @@
 #include "emulator/panel/Keypad.h"
 #include "emulator/terminal/TerminalKeys.h"
 #include "emulator/terminal/TerminalRescue.h"
+#include "emulator/terminal/TerminalScreen.h"
 
 #include <array>
 #include <functional>
+#include <string>
 
 namespace emulator {
 
@@ -38,6 +40,8 @@ class TerminalFront : public Operator {
     void resize();
     /// Gives the terminal back while the emulator is stopped, and takes it over again.
     void stopWith(const std::function<void()> &stop);
+    /// Shows a line below the panel from now on.
+    void tell(const std::string &itsWord) { word = itsWord; }
 
   private:
     void readInput();
@@ -54,6 +58,7 @@ class TerminalFront : public Operator {
     void drawLine(TimePoint now);
 
     TerminalRescue rescue;
+    TerminalScreen screen;
     // Not standard input itself, because the loop reads without blocking, and the shell would share
     // that setting.
     FileDescriptor keyboard;
@@ -67,6 +72,7 @@ class TerminalFront : public Operator {
     bool isGone = false; // the terminal
     std::array<TimePoint, keys.size()> litUntil{};
     LineLoad load;
+    std::string word; // told below the panel
     TimePoint drawAgain;
 };
 

@@ -10,10 +10,12 @@ namespace emulator {
 namespace {
 
 constexpr char escapeByte = '\033';
-// How long an ESC may be the start of a sequence, and how long a sequence may pause.
-constexpr std::chrono::milliseconds loneEscape{25};
-constexpr std::chrono::milliseconds brokenSequence{200};
+// How long an ESC may be the start of a sequence, which a slow connection delivers in pieces, and
+// how long a sequence or a pasted text may pause.
+constexpr std::chrono::milliseconds loneEscape{150};
+constexpr std::chrono::milliseconds brokenSequence{250};
 constexpr std::size_t longestSequence = 32;
+constexpr std::string_view pasteBegins = "[200~", pasteEnds = "[201~";
 
 // The sequences that terminals in use send after ESC for these keys.
 struct KeySequence {
@@ -70,40 +72,79 @@ std::vector<TerminalKeys::Event> TerminalKeys::take(std::string_view bytes, Time
 std::vector<TerminalKeys::Event> TerminalKeys::look(TimePoint now) {
     std::vector<Event> events;
     if (const std::optional<TimePoint> end = wakeAt(); end && now >= *end) {
-        if (sequence.size() == 1)
-            events.emplace_back(Tap{Key::escape});
+        if (isEscapes())
+            events.insert(events.end(), sequence.size(), Tap{Key::escape});
         sequence.clear();
+        isPasting = false;
     }
     return events;
 }
 
 std::optional<TimePoint> TerminalKeys::wakeAt() const {
-    if (sequence.empty())
+    if (sequence.empty() && !isPasting)
         return std::nullopt;
-    return lastByte + (sequence.size() == 1 ? loneEscape : brokenSequence);
+    return lastByte + (isEscapes() ? loneEscape : brokenSequence);
+}
+
+bool TerminalKeys::isEscapes() const {
+    return !sequence.empty() && sequence.back() == escapeByte && !isInString();
 }
 
 void TerminalKeys::takeByte(char byte, std::vector<Event> &events) {
-    if (byte == escapeByte) {
-        if (sequence.size() == 1)
+    if (isInString()) {
+        takeStringByte(byte, events);
+    } else if (byte == escapeByte) {
+        // Two may be the start of a key with Alt, which some terminals send so.
+        if (sequence.size() == 2 && sequence[1] == escapeByte)
             events.emplace_back(Tap{Key::escape});
-        sequence = byte;
-        return;
-    }
-    if (sequence.empty()) {
+        else if (sequence.size() > 1)
+            sequence.clear();
+        if (sequence.size() < 2)
+            sequence += byte;
+    } else if (!sequence.empty()) {
+        takeSequenceByte(byte, events);
+    } else if (!isPasting) {
         takeCharacter(byte, events);
-        return;
     }
+}
+
+void TerminalKeys::takeSequenceByte(char byte, std::vector<Event> &events) {
     sequence += byte;
-    const bool isIntroducer = sequence.size() == 2 && (byte == '[' || byte == 'O');
-    const bool isOpen = sequence.size() > 2 && sequence[1] == '[' && !isFinal(byte);
-    if (isIntroducer || (isOpen && sequence.size() < longestSequence))
-        return;
-    finishSequence(events);
+    const std::size_t begin = sequence.find_last_of(escapeByte);
+    const std::size_t length = sequence.size() - begin;
+    const char introducer = sequence[begin + 1];
+    const bool isComplete = introducer == '['   ? length > 2 && isFinal(byte)
+                            : introducer == 'O' ? length > 2
+                                                : !isInString();
+    if (isComplete || sequence.size() == longestSequence)
+        finishSequence(events);
+}
+
+// What a terminal answers to a question, for example about its colours, is a string of any length.
+bool TerminalKeys::isInString() const {
+    constexpr std::string_view introducers = "]P_^X";
+    return sequence.size() > 1 && introducers.find(sequence[1]) != std::string_view::npos;
+}
+
+// A string ends with BEL or with ESC \, and any other sequence ends it, too.
+void TerminalKeys::takeStringByte(char byte, std::vector<Event> &events) {
+    if (sequence.back() == escapeByte) {
+        sequence = byte == '\\' ? "" : std::string(1, escapeByte);
+        if (!sequence.empty())
+            takeByte(byte, events);
+    } else if (byte == escapeByte) {
+        sequence += byte;
+    } else if (byte == '\a') {
+        sequence.clear();
+    }
 }
 
 void TerminalKeys::finishSequence(std::vector<Event> &events) {
     const std::string text = std::exchange(sequence, "").substr(1);
+    if (text == pasteBegins || text == pasteEnds)
+        isPasting = text == pasteBegins;
+    if (isPasting)
+        return;
     const auto *known = std::find_if(keySequences.begin(), keySequences.end(),
                                      [&](const KeySequence &each) { return each.text == text; });
     if (known != keySequences.end())

@@ -12,7 +12,8 @@
 namespace emulator {
 
 /// Reads keys and the mouse from the bytes that a terminal sends. A sequence that is not known
-/// means nothing, and one that is not continued is forgotten, so that nothing waits for its end.
+/// means nothing, nor does a pasted text, and one that is not continued is forgotten, so that
+/// nothing waits for its end.
 class TerminalKeys {
   public:
     struct Tap {
@@ -36,11 +37,16 @@ class TerminalKeys {
     [[nodiscard]] std::optional<TimePoint> wakeAt() const;
 
   private:
+    [[nodiscard]] bool isEscapes() const;
+    [[nodiscard]] bool isInString() const;
     void takeByte(char byte, std::vector<Event> &events);
+    void takeSequenceByte(char byte, std::vector<Event> &events);
+    void takeStringByte(char byte, std::vector<Event> &events);
     void takeCharacter(char byte, std::vector<Event> &events);
     void finishSequence(std::vector<Event> &events);
 
-    std::string sequence; // the part that has come, beginning with ESC
+    std::string sequence;   // the part that has come, beginning with ESC; of a string, its ends
+    bool isPasting = false; // a text from elsewhere, which presses no keys
     TimePoint lastByte;
 };
 

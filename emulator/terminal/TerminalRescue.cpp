@@ -23,7 +23,7 @@ struct State {
 };
 State state;
 
-constexpr std::array<int, 5> crashes{SIGSEGV, SIGBUS, SIGFPE, SIGILL, SIGABRT};
+constexpr std::array crashes{SIGSEGV, SIGBUS, SIGFPE, SIGILL, SIGABRT, SIGSYS, SIGTRAP};
 std::array<struct sigaction, crashes.size()> formerActions;
 
 int keep(int byte) {

@@ -31,8 +31,10 @@ TEST(TerminalKeys, KnowsKeysAndTheMouseAndPassesOverEverythingElse) {
         {"\033[1;2A\033[b\033[13;2u\033[27;2;27~", "UDEX"},
         {"\033[<0;35;2M\033[<0;35;2m", "Mm"},
         {"q?", "Q."},
-        {"\033[I\033[O\033[200~\033[201~\033[5~\033[<64;1;1M\033q\033[1;5C", ""},
-        {"\033\033[A", "xu"},
+        {"\033[I\033[O\033[5~\033[<64;1;1M\033q\033[1;5C", ""},
+        {"\033\033[A\033[A\033\033\033[A", "ux"}, // with Alt, as some terminals send it
+        {"\033[200~q\033[Ad\r\033[201~u", "U"},
+        {"\033]11;rgb:dddd/d\a\033Pd\033\\\033]d\033[B", "d"},
         {"\033[" + std::string(40, '1') + "A", std::string(11, '.')}, // given up after 32 bytes
     };
     for (const auto &[bytes, meaning] : cases)
@@ -43,13 +45,17 @@ TEST(TerminalKeys, WaitsForTheRestOfASequenceButNotForEver) {
     TerminalKeys keys;
     const TimePoint now;
     EXPECT_EQ(letters(keys.take("\033", now)), "");
-    EXPECT_EQ(letters(keys.look(now + 24ms)), "");
-    EXPECT_EQ(letters(keys.look(now + 25ms)), "x");
+    EXPECT_EQ(letters(keys.look(now + 149ms)), "");
+    EXPECT_EQ(letters(keys.look(now + 150ms)), "x");
+    EXPECT_EQ(letters(keys.take("\033\033", now)), "");
+    EXPECT_EQ(letters(keys.look(now + 150ms)), "xx");
     EXPECT_EQ(letters(keys.take("\033", now)), "");
-    EXPECT_EQ(letters(keys.take("[<0;35", now + 20ms)), "");
-    EXPECT_EQ(letters(keys.take(";2M", now + 40ms)), "M");
-    EXPECT_EQ(letters(keys.take("\033[<", now)), "");
-    EXPECT_EQ(letters(keys.take("q", now + 250ms)), "Q");
+    EXPECT_EQ(letters(keys.take("[<0;35", now + 140ms)), "");
+    EXPECT_EQ(letters(keys.take(";2M", now + 280ms)), "M");
+    for (const char *broken : {"\033[<", "\033]11", "\033[200~dd"}) {
+        EXPECT_EQ(letters(keys.take(broken, now)), "");
+        EXPECT_EQ(letters(keys.take("q", now + 250ms)), "Q");
+    }
     EXPECT_FALSE(keys.wakeAt());
 }
 
