@@ -1,5 +1,6 @@
 #include "emulator/Emulator.h"
 
+#include "emulator/base/complain.h"
 #include "emulator/panel/Picture.h"
 
 #include <algorithm>
@@ -9,6 +10,7 @@
 #include <exception>
 #include <initializer_list>
 #include <iostream>
+#include <set>
 #include <stdexcept>
 #include <utility>
 
@@ -24,13 +26,28 @@ constexpr std::chrono::seconds browserPatience{1};
 constexpr std::chrono::milliseconds idleTurn{500};
 constexpr std::chrono::milliseconds longestTurn{1000};
 
+// All that would otherwise end the emulator without giving the terminal back, and those that mean
+// something to it. A crash is the terminal's rescue's.
+std::vector<int> handledSignals() {
+    const std::set<int> others{SIGKILL, SIGSTOP, SIGCHLD, SIGCONT, SIGURG,
+                               SIGTTIN, SIGTTOU, SIGPIPE, SIGSEGV, SIGBUS,
+                               SIGFPE,  SIGILL,  SIGABRT, SIGSYS,  SIGTRAP};
+    std::vector<int> handled;
+    for (int number = 1; number <= SIGRTMAX; number++) {
+        const bool isReserved = number > SIGSYS && number < SIGRTMIN; // for the C library
+        if (!isReserved && others.count(number) == 0)
+            handled.push_back(number);
+    }
+    return handled;
+}
+
 // The address has a line of its own, so that other programs can read it.
 void announce(const WebServer &server) {
-    std::cout << server.address() << '\n' << std::flush;
+    if (!(std::cout << server.address() << '\n' << std::flush))
+        throw std::runtime_error("cannot write the page's address to standard output");
     if (server.isOpenToOthers())
-        std::cerr
-            << "panel-emulator: other machines can open this page, too, at this machine's "
-               "address;\nwhoever has the link stands at the panel, and nothing is encrypted\n";
+        complain("other machines can open this page, too, at this machine's address;\nwhoever has "
+                 "the link stands at the panel, and nothing is encrypted");
 }
 
 std::vector<std::string> withPath(std::vector<std::string> command, const std::string &path) {
@@ -59,8 +76,7 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
     : loop([this] { turn(); }), line(options.fast, options.trace),
       keypad([this](Key key) { line.answer(traits(key).code); }),
       arrivals(loop, line.descriptor(), [] {}), output(loop), lastTurn(Clock::now()) {
-    loop.onSignals({SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGTSTP, SIGWINCH},
-                   [this](int number) { handleSignal(number); });
+    loop.onSignals(handledSignals(), [this](int number) { handleSignal(number); });
     setenv("PANEL_TTY", line.path().c_str(), 1);
     FileDescriptor commandOutput;
     isJourney = journey.has_value();
@@ -75,10 +91,10 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
         front = std::make_unique<TerminalFront>(loop, display, keypad, use);
     if (options.isDrawn() || !isJourney)
         commandOutput = output.open();
-    // Everything that may fail comes first, so that an older recording is not overwritten for
-    // nothing.
     if (options.record)
-        startRecording(*options.record);
+        recorder = std::make_unique<Recorder>(recording.emplace(*options.record), display, keypad);
+    if (webFront)
+        announce(webFront->webServer());
     // The recorder looks before anybody presses the next key.
     for (Operator *each : std::initializer_list<Operator *>{recorder.get(), webFront.get(),
                                                             journeyOperator.get(), front.get()}) {
@@ -90,15 +106,6 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
     setenv("PANEL_COMMAND_PID", std::to_string(command->pid()).c_str(), 1);
     if (journeyOperator)
         journeyOperator->setCommand(options.command.front(), command->pid());
-    if (webFront)
-        announce(webFront->webServer());
-}
-
-void Emulator::startRecording(const std::string &path) {
-    recording.open(path);
-    recorder = std::make_unique<Recorder>(recording, display, keypad);
-    if (!recording)
-        throw std::runtime_error("cannot write " + path);
 }
 
 int Emulator::run() {
@@ -118,7 +125,7 @@ int Emulator::run() {
     } catch (const std::runtime_error &error) {
         if (!failure)
             throw;
-        std::cerr << "panel-emulator: " << error.what() << '\n';
+        complain(error.what());
     }
     if (failure)
         std::rethrow_exception(failure);
@@ -132,6 +139,11 @@ void Emulator::handleSignal(int number) {
     } else if (number == SIGTSTP) {
         const auto stop = [] { raise(SIGSTOP); };
         front ? front->stopWith(stop) : stop();
+    } else if (number == SIGUSR1) {
+        // A reload that is meant for the program, and sent by its name, often meets its emulator,
+        // in whose command line that name stands, too.
+        const std::string word = "SIGUSR1 is for the program, not for its emulator: ignored";
+        front ? front->tell(word) : complain(word);
     } else if (!result) {
         finish(signalStatus + number, "a signal ended it (" + std::string(strsignal(number)) + ")");
     }
@@ -219,18 +231,17 @@ void Emulator::dismissOperators() {
 
 void Emulator::closeRecording() {
     recorder->finish();
-    recording.close();
-    if (!recording)
-        throw std::runtime_error("cannot write all of the recording");
+    recording->finish("the recording");
 }
 
 void Emulator::report() {
     const std::optional<int> status = command->status();
     if (!status || command->isLeftRunning())
-        std::cerr << "panel-emulator: the command cannot be ended: it is left running\n";
-    if (hasCommandEndedItself)
-        std::cerr << output.lastWords() << "panel-emulator: the command ended with "
-                  << described(*status) << "\n";
+        complain("the command cannot be ended: it is left running");
+    if (hasCommandEndedItself) {
+        std::cerr << masked(output.lastWords());
+        complain("the command ended with " + described(*status));
+    }
     if (isJourney && display.unknownCommands() + display.hiddenCharacters() > 0) {
         std::cout << "unknown commands: " << display.unknownCommands()
                   << ", characters past the visible columns: " << display.hiddenCharacters()

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "emulator/Options.h"
+#include "emulator/base/LateFile.h"
 #include "emulator/base/Loop.h"
 #include "emulator/command/ChildProcess.h"
 #include "emulator/command/CommandOutput.h"
@@ -12,7 +13,6 @@
 #include "emulator/terminal/TerminalFront.h"
 #include "emulator/web/WebFront.h"
 
-#include <fstream>
 #include <memory>
 #include <string>
 #include <vector>
@@ -33,7 +33,6 @@ class Emulator {
     int run();
 
   private:
-    void startRecording(const std::string &path);
     void handleSignal(int number);
     void turn();
     [[nodiscard]] TimePoint nextTurn(TimePoint now) const;
@@ -53,7 +52,7 @@ class Emulator {
     std::unique_ptr<JourneyOperator> journeyOperator;
     std::unique_ptr<TerminalFront> front;
     std::unique_ptr<WebFront> webFront;
-    std::ofstream recording;
+    std::optional<LateFile> recording;
     std::unique_ptr<Recorder> recorder;
     std::vector<Operator *> operators; // those of the above that exist, until all is over
     std::unique_ptr<ChildProcess> command;

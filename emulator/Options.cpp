@@ -6,16 +6,16 @@
 
 #include <algorithm>
 #include <array>
+#include <filesystem>
 #include <getopt.h>
 #include <stdexcept>
 #include <string_view>
+#include <sys/stat.h>
+#include <utility>
 
 namespace emulator {
 
 namespace {
-
-constexpr double shortestLimit = 0.001; // seconds
-constexpr double longestLimit = 86'400;
 
 // An IPv6 address is written in brackets.
 boost::asio::ip::tcp::endpoint parseEndpoint(const std::string &text) {
@@ -29,7 +29,11 @@ boost::asio::ip::tcp::endpoint parseEndpoint(const std::string &text) {
     boost::system::error_code error;
     const auto parsed = boost::asio::ip::make_address(address, error);
     if (error || parsed.is_v6() != isBracketed)
-        throw std::invalid_argument("'" + text + "' is not an [ADDRESS:]PORT for --web");
+        throw std::invalid_argument("'" + text +
+                                    "' is not an [ADDRESS:]PORT for --web, such as "
+                                    "8080, 127.0.0.1:8080 or [::1]:8080; names are not looked up");
+    if (parsed.is_multicast() || parsed == boost::asio::ip::address_v4::broadcast())
+        throw std::invalid_argument("no page can be opened at " + address);
     return {parsed,
             static_cast<unsigned short>(parseNumber(hasAddress ? text.substr(colon + 1) : text, 0U,
                                                     highestPort, "a port for --web"))};
@@ -79,6 +83,18 @@ constexpr std::array optionKinds{
                [](Options &options, const char *) { options.help = true; }},
 };
 
+// Of a file that is not there yet, the name counts.
+bool isSameFile(const std::string &one, const std::string &other) {
+    namespace fs = std::filesystem;
+    struct stat first{}, second{};
+    const bool isThere = stat(one.c_str(), &first) == 0;
+    if (isThere != (stat(other.c_str(), &second) == 0))
+        return false;
+    if (!isThere)
+        return fs::weakly_canonical(fs::absolute(one)) == fs::weakly_canonical(fs::absolute(other));
+    return S_ISREG(first.st_mode) && first.st_dev == second.st_dev && first.st_ino == second.st_ino;
+}
+
 std::string optionsHelp() {
     constexpr std::size_t indent = 21;
     std::string text;
@@ -113,6 +129,8 @@ Options Options::parse(int argc, char *const *argv) {
             throw std::invalid_argument("unknown option " + argument);
         if (found == -1)
             break;
+        if (optarg != nullptr && *optarg == '\0')
+            throw std::invalid_argument(argument + " needs a value that is not empty");
         if (found == 'h')
             options.help = true;
         else
@@ -128,6 +146,22 @@ Options Options::parse(int argc, char *const *argv) {
     if (options.show && options.web)
         throw std::invalid_argument("--show and --web cannot be combined");
     return options;
+}
+
+void Options::checkFiles() const {
+    constexpr const char *standardInput = "/dev/stdin";
+    const std::array<std::pair<const char *, std::optional<std::string>>, 3> files{{
+        {"--journey", journey == "-" ? standardInput : journey},
+        {"--record", record},
+        {"--trace", trace},
+    }};
+    for (const auto &[name, file] : files) {
+        for (const auto &[otherName, otherFile] : files) {
+            if (name != otherName && file && otherFile && isSameFile(*file, *otherFile))
+                throw std::invalid_argument(std::string(name) + " and " + otherName +
+                                            " name the same file");
+        }
+    }
 }
 
 std::string Options::helpText() {

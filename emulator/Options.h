@@ -30,6 +30,10 @@ struct Options {
     /// wrong.
     static Options parse(int argc, char *const *argv);
 
+    /// Throws std::invalid_argument if two of the files are one, of which the other's contents
+    /// would be lost.
+    void checkFiles() const;
+
     /// The text of `--help`.
     static std::string helpText();
 };

@@ -1,6 +1,8 @@
 #include "emulator/Emulator.h"
 #include "emulator/Options.h"
+#include "emulator/base/complain.h"
 
+#include <csignal>
 #include <fcntl.h>
 #include <fstream>
 #include <iostream>
@@ -10,16 +12,6 @@ namespace {
 
 constexpr int exitFailed = 1;
 constexpr int exitUsage = 2;
-
-// A message may quote what somebody else has written, which must not control the terminal.
-int complain(int status, const std::string &message) {
-    std::cerr << "panel-emulator: ";
-    for (const char c : message)
-        std::cerr << (static_cast<unsigned char>(c) < ' ' && c != '\n' ? '?' : c);
-    if (message.back() != '\n')
-        std::cerr << '\n'; // a picture at the end of a message has its own
-    return status;
-}
 
 // The pseudo-terminal must not become one of the standard descriptors. Those that are closed are
 // taken by something that can be neither written nor read, just like a closed one.
@@ -31,6 +23,17 @@ void occupyStandardDescriptors() {
         close(taken);
 }
 
+// Whoever has started this program may have ignored or blocked signals that it relies on, such as
+// the one that tells of the command's end. Output that nobody reads is to be noticed when it is
+// written.
+void resetSignals() {
+    sigset_t none;
+    sigemptyset(&none);
+    sigprocmask(SIG_SETMASK, &none, nullptr);
+    for (int number = 1; number < NSIG; number++)
+        signal(number, number == SIGPIPE ? SIG_IGN : SIG_DFL);
+}
+
 emulator::Journey readJourney(const std::string &path) {
     if (path == "-")
         return {std::cin, "standard input"};
@@ -40,33 +43,40 @@ emulator::Journey readJourney(const std::string &path) {
     return {file, path};
 }
 
+// Reads all that the emulator was asked to do, and returns its journey, if any. Throws if that is
+// wrong; nothing has been changed by then.
+std::optional<emulator::Journey> prepare(const emulator::Options &options) {
+    options.checkFiles();
+    std::optional<emulator::Journey> journey;
+    if (options.journey)
+        journey = readJourney(*options.journey);
+    if (options.isDrawn() && (!isatty(STDIN_FILENO) || !isatty(STDOUT_FILENO)))
+        throw std::invalid_argument(journey ? "--show needs a terminal to draw on"
+                                            : "this is not a terminal: give --journey or --web");
+    if (options.pictures)
+        std::filesystem::create_directories(*options.pictures);
+    return journey;
+}
+
 } // namespace
 
 int main(int argc, char **argv) {
     occupyStandardDescriptors();
-    emulator::Options options;
-    std::optional<emulator::Journey> journey;
+    resetSignals();
+    int failed = exitUsage;
     try {
-        options = emulator::Options::parse(argc, argv);
-        if (options.help) {
-            std::cout << emulator::Options::helpText() << std::flush;
-            return std::cout ? EXIT_SUCCESS
-                             : complain(exitFailed, "cannot write to standard output");
-        }
-        if (options.journey)
-            journey = readJourney(*options.journey);
-        if (options.isDrawn() && (!isatty(STDIN_FILENO) || !isatty(STDOUT_FILENO)))
-            throw std::invalid_argument(journey
-                                            ? "--show needs a terminal to draw on"
-                                            : "this is not a terminal: give --journey or --web");
-        if (options.pictures)
-            std::filesystem::create_directories(*options.pictures);
+        const emulator::Options options = emulator::Options::parse(argc, argv);
+        std::optional<emulator::Journey> journey;
+        if (!options.help)
+            journey = prepare(options);
+        failed = exitFailed;
+        if (!options.help)
+            return emulator::Emulator(options, std::move(journey)).run();
+        if (!(std::cout << emulator::Options::helpText() << std::flush))
+            throw std::runtime_error("cannot write to standard output");
+        return EXIT_SUCCESS;
     } catch (const std::exception &error) {
-        return complain(exitUsage, error.what());
-    }
-    try {
-        return emulator::Emulator(options, std::move(journey)).run();
-    } catch (const std::exception &error) {
-        return complain(exitFailed, error.what());
+        emulator::complain(error.what());
+        return failed;
     }
 }

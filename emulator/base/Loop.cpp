@@ -22,7 +22,7 @@ void Loop::wakeAt(std::optional<TimePoint> time) {
     });
 }
 
-void Loop::onSignals(std::initializer_list<int> numbers, std::function<void(int)> handler) {
+void Loop::onSignals(const std::vector<int> &numbers, std::function<void(int)> handler) {
     for (const int number : numbers)
         signals.add(number);
     onSignal = std::move(handler);

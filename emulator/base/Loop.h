@@ -8,9 +8,9 @@
 #include <boost/asio/steady_timer.hpp>
 
 #include <functional>
-#include <initializer_list>
 #include <optional>
 #include <utility>
+#include <vector>
 
 namespace emulator {
 
@@ -30,7 +30,7 @@ class Loop {
     /// The next time at which to take a turn even if nothing happens, if any.
     void wakeAt(std::optional<TimePoint> time);
     /// Calls `handler` with each of these signals from now on.
-    void onSignals(std::initializer_list<int> numbers, std::function<void(int)> handler);
+    void onSignals(const std::vector<int> &numbers, std::function<void(int)> handler);
 
     /// For what waits for more than a descriptor's readability; its handlers are to be made with
     /// `turnAfter`.

@@ -92,22 +92,32 @@ bool isChoice(const std::string &word, const std::string &choices) {
 } // namespace
 
 void checkVerb(const std::vector<std::string> &words) {
-    std::string usages;
+    const auto usagesOf = [](const std::vector<std::string> &beginning) {
+        std::string usages;
+        for (const Verb &verb : verbs) {
+            const std::vector<std::string> wanted = split(verb.usage, ' ');
+            if (wanted.size() >= beginning.size() &&
+                std::equal(beginning.begin(), beginning.end(), wanted.begin()))
+                usages += (usages.empty() ? "" : " or ") + std::string("appliance ") +
+                          std::string(verb.usage);
+        }
+        return usages;
+    };
     for (const Verb &verb : verbs) {
         const std::vector<std::string> wanted = split(verb.usage, ' ');
         if (wanted.size() == words.size() &&
             std::equal(words.begin(), words.end(), wanted.begin(), isChoice))
             return;
-        const bool isMeant =
-            wanted.front() == words.front() &&
-            (words.front() != "has" || (words.size() > 1 && wanted[1] == words[1]));
-        if (isMeant)
-            usages += (usages.empty() ? "" : " or ") + std::string("appliance ") +
-                      std::string(verb.usage);
     }
-    throw std::invalid_argument(usages.empty()
-                                    ? "'" + words.front() + "' is not a verb of the appliance"
-                                    : "usage: " + usages);
+    const std::string usages = usagesOf({words.front()});
+    if (usages.empty())
+        throw std::invalid_argument("'" + words.front() + "' is not a verb of the appliance");
+    if (words.front() != "has" || words.size() == 1)
+        throw std::invalid_argument("usage: " + usages);
+    const std::string closer = usagesOf({words[0], words[1]});
+    throw std::invalid_argument(closer.empty()
+                                    ? "'" + words[1] + "' cannot be checked; usage: " + usages
+                                    : "usage: " + closer);
 }
 
 std::string verbsHelp() {

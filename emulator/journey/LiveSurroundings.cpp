@@ -1,5 +1,8 @@
 #include "emulator/journey/LiveSurroundings.h"
 
+#include <filesystem>
+#include <stdexcept>
+
 namespace emulator {
 
 void LiveSurroundings::start(const step::Run &run) {
@@ -8,6 +11,9 @@ void LiveSurroundings::start(const step::Run &run) {
 }
 
 void LiveSurroundings::start(const step::Appliance &appliance) {
+    if (std::filesystem::weakly_canonical(program).filename() != "kestrova-panel-box")
+        throw std::runtime_error("this step needs the box, in which the appliance is: start the "
+                                 "program with kestrova-panel-box");
     std::vector<std::string> command{program, "--enter", pid, "--", "appliance"};
     command.insert(command.end(), appliance.words.begin(), appliance.words.end());
     process = std::make_unique<ChildProcess>(loop, command);

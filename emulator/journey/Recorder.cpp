@@ -1,9 +1,10 @@
 #include "emulator/journey/Recorder.h"
 
-#include "emulator/journey/StepTable.h"
+#include "emulator/journey/words.h"
 #include "emulator/panel/Font.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace emulator {
 
@@ -33,16 +34,17 @@ std::string stepThatExpects(const Display &display) {
 
 Recorder::Recorder(std::ostream &itsOutput, const Display &itsDisplay, const Keypad &itsKeypad)
     : display(itsDisplay), keypad(itsKeypad), output(itsOutput), answersSeen(keypad.answered()),
-      requestsSeen(keypad.requests()) {
-    // The longest that the program keeps a page is a minute.
-    output << "# Recorded at the panel.\nlimit 90\n" << std::flush;
-}
+      requestsSeen(keypad.requests()) {}
 
 std::optional<int> Recorder::look(TimePoint) {
     // A key that is answered at its request was pressed while the panel showed what it does now:
     // the request comes behind everything that the program has drawn before it.
     const bool isAsked = keypad.requests() != requestsSeen;
     requestsSeen = keypad.requests();
+    if (isAsked && !std::exchange(hasBegun, true)) {
+        // The longest that the program keeps a page is a minute.
+        output << "# Recorded at the panel.\nlimit 90\n" << std::flush;
+    }
     if (isAsked || keypad.answered() != answersSeen)
         sight = stepThatExpects(display);
     countAnswers();
@@ -91,7 +93,8 @@ std::string Recorder::end() const {
 
 void Recorder::finish() {
     countAnswers(); // the last answer may have come after the last look
-    output << end() << std::flush;
+    if (hasBegun)
+        output << end() << std::flush;
 }
 
 } // namespace emulator

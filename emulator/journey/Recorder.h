@@ -16,7 +16,7 @@ namespace emulator {
 /// changed once it has been written.
 class Recorder : public Operator {
   public:
-    /// Writes to `output` from now on.
+    /// Writes to `output` once the program asks for a key.
     Recorder(std::ostream &output, const Display &display, const Keypad &keypad);
 
     std::optional<int> look(TimePoint now) override;
@@ -45,6 +45,7 @@ class Recorder : public Operator {
     unsigned long answersSeen;
     unsigned long requestsSeen;
     std::optional<Held> held;
+    bool hasBegun = false;
     bool isKeyDown = false; // at the end of what has been written
     std::string sight;      // the steps that expect what was shown at the last key request
 };

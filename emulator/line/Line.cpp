@@ -50,11 +50,8 @@ Line::Line(bool fast, const std::optional<std::string> &tracePath)
     cfsetospeed(&settings, B2400);
     if (tcsetattr(slave.get(), TCSANOW, &settings) != 0)
         fail("cannot set " + slavePath);
-    if (tracePath) {
-        traceFile.open(*tracePath);
-        if (!traceFile)
-            fail("cannot write " + *tracePath);
-    }
+    if (tracePath)
+        traceFile.emplace(*tracePath);
 }
 
 int Line::descriptor() const {
@@ -124,21 +121,18 @@ void Line::answer(unsigned char keyCode) {
 }
 
 void Line::trace(char direction, TimePoint time, const unsigned char *bytes, std::size_t count) {
-    if (!traceFile.is_open())
+    if (!traceFile)
         return;
     const std::chrono::nanoseconds sinceStart = time.time_since_epoch();
-    traceFile << sinceStart.count() << ' ' << direction;
+    *traceFile << sinceStart.count() << ' ' << direction;
     for (std::size_t i = 0; i < count; i++)
-        traceFile << ' ' << hexadecimal(bytes[i]);
-    traceFile << '\n' << std::flush;
+        *traceFile << ' ' << hexadecimal(bytes[i]);
+    *traceFile << '\n' << std::flush;
 }
 
 void Line::finishTrace() {
-    if (!traceFile.is_open())
-        return;
-    traceFile.close();
-    if (!traceFile)
-        throw std::runtime_error("cannot write all of the trace");
+    if (traceFile)
+        traceFile->finish("the trace");
 }
 
 } // namespace emulator

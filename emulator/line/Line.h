@@ -2,10 +2,10 @@
 
 #include "emulator/base/Clock.h"
 #include "emulator/base/FileDescriptor.h"
+#include "emulator/base/LateFile.h"
 
 #include <cstdint>
 #include <deque>
-#include <fstream>
 #include <optional>
 #include <string>
 #include <vector>
@@ -65,7 +65,7 @@ class Line {
     FileDescriptor slave; // held open so that settings outlive the program's own descriptors
     std::string slavePath;
     Clock::duration byteTime;
-    std::ofstream traceFile;
+    std::optional<LateFile> traceFile;
     std::deque<Arrival> backlog;
     TimePoint carriedUntil; // when the line became free after the last byte given out
     std::uint64_t answersWritten = 0;

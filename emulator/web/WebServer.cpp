@@ -49,7 +49,12 @@ std::string WebServer::address() const {
 }
 
 bool WebServer::isOpenToOthers() const {
-    return !acceptor.local_endpoint().address().is_loopback();
+    using boost::asio::ip::make_address_v4;
+    using boost::asio::ip::v4_mapped;
+    const auto address = acceptor.local_endpoint().address();
+    const bool isMapped = address.is_v6() && address.to_v6().is_v4_mapped();
+    return !(isMapped ? make_address_v4(v4_mapped, address.to_v6()).is_loopback()
+                      : address.is_loopback());
 }
 
 bool WebServer::hasPages() const {

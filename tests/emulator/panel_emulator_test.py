@@ -112,7 +112,12 @@ class WithoutTerminal(unittest.TestCase):
                 (1, "trace", "tap up", ["--trace", "/dev/full"], KEYS),
                 (2, "no step in it", "", [], "true"),
                 (2, "too long", "x" * 100_000, [], "true"),
-                (2, "not text", "say \033[2J", [], "true"),
+                (2, "control character", "say a\rsay b", [], "true"),
+                (2, "'prot' cannot be checked", "appliance has prot eth0 -", [], "true"),
+                (1, "needs the box", "appliance refresh", [], "sleep 30"),
+                (2, "--record needs a value", "release", ["--record", ""], "true"),
+                (2, "names are not looked up", "release", ["--web", "localhost:0"], "true"),
+                (2, "no page can be opened", "release", ["--web", "255.255.255.255:0"], "true"),
                 (2, "from 0.001 to 86400", "release", ["--limit", "0"], "true"),
                 (2, "unknown option -fast", "release", ["-fast"], "true"),
                 (2, "not an [ADDRESS:]PORT", "release", ["--web", "::1:80"], "true"),
@@ -124,9 +129,26 @@ class WithoutTerminal(unittest.TestCase):
                 self.assertIn(said, done.stderr)
                 self.assertEqual(done.stderr.count("panel-emulator: "), 1)
 
+    def test_no_file_is_lost_by_naming_it_twice_or_by_a_command_that_cannot_be_run(self):
+        with tempfile.TemporaryDirectory() as folder:
+            journey, link, new = (f"{folder}/{name}" for name in ("journey", "link", "new"))
+            Path(journey).write_text("wait 60\n", encoding="ascii")
+            os.link(journey, link)
+            for options in (("--journey", journey, "--record", link),
+                            ("--journey", journey, "--trace", f"{folder}/./journey"),
+                            ("--record", new, "--trace", f"{folder}/./new")):
+                done = play("wait 60", *options)
+                self.assertEqual((done.returncode, done.stderr[-19:]), (2, "name the same file\n"))
+            self.assertEqual(play("wait 60", "--record", journey, "--trace", new,
+                                  command="exec /no-such-file").returncode, 1)
+            self.assertEqual(Path(journey).read_text(encoding="ascii"), "wait 60\n")
+            self.assertFalse(Path(new).exists())
+
     def test_output_that_cannot_be_written_is_a_failure(self):
         with open("/dev/full", "w", encoding="ascii") as full:
-            self.assertEqual(play("say x", stdout=full, stderr=subprocess.DEVNULL).returncode, 1)
+            for journey, options in (("say x", []), ("wait 60", ["--web", "0"])):
+                self.assertEqual(play(journey, *options, stdout=full,
+                                      stderr=subprocess.DEVNULL).returncode, 1)
         # If standard output is closed, its number must not become that of the pseudo-terminal.
         closed = play("say x\nexpect ready", stdout=None, stderr=subprocess.DEVNULL,
                       preexec_fn=lambda: os.close(1))
@@ -158,6 +180,28 @@ class WithoutTerminal(unittest.TestCase):
             time.sleep(0.05)
 
 
+    def test_a_step_leaves_nothing_running_however_the_emulator_was_started(self):
+        def ignore_and_block():
+            signal.signal(signal.SIGCHLD, signal.SIG_IGN)
+            signal.pthread_sigmask(signal.SIG_BLOCK, {signal.SIGTERM, signal.SIGCHLD})
+
+        done = play('run setsid sleep 54.32 & sleep 0.2\nrun ! ps ax | grep -q "[s]leep 54.32"',
+                    preexec_fn=ignore_and_block)
+        self.assertEqual(done.returncode, 0)
+
+    def test_the_end_of_a_guard_that_somebody_kills_is_the_end_of_its_command(self):
+        with subprocess.Popen([EMULATOR, "--journey", "-", "--", "sleep", "60"], text=True,
+                              stdin=subprocess.PIPE, stderr=subprocess.PIPE) as emulator:
+            emulator.stdin.write("wait 60\n")
+            emulator.stdin.close()
+            while len(descendants(emulator.pid)) < 2:
+                time.sleep(0.05)
+            os.kill(min(descendants(emulator.pid)), signal.SIGKILL)
+            said = emulator.stderr.read()
+        self.assertIn("status 137", said)
+        self.assertNotIn("left running", said)
+
+
 class OnTerminal(unittest.TestCase):
     def test_it_ends_when_the_operator_quits_and_when_the_terminal_goes_away(self):
         terminal = Terminal()
@@ -175,6 +219,18 @@ class OnTerminal(unittest.TestCase):
             self.assertEqual(terminal.status(), 1)
             self.assertIn(b"check TERM", terminal.shown)
 
+    def test_unexpected_signals_and_sizes_neither_hold_it_up_nor_leave_the_terminal_changed(self):
+        terminal = Terminal()
+        terminal.read_until(b"ready")
+        terminal.process.send_signal(signal.SIGUSR1)
+        terminal.read_until(b"SIGUSR1")
+        for lines in (40_000, *range(20, 60)):  # drawn for nobody to read
+            fcntl.ioctl(terminal.end, termios.TIOCSWINSZ, struct.pack("HHHH", lines, lines, 0, 0))
+            time.sleep(0.05)
+        terminal.process.send_signal(signal.SIGALRM)
+        self.assertEqual(terminal.process.wait(timeout=3), 128 + signal.SIGALRM)
+        self.assertTrue(termios.tcgetattr(terminal.other_end)[3] & termios.ECHO)
+
     def test_a_stopped_terminal_does_not_hold_it_up_and_is_given_back_as_it_was(self):
         terminal = Terminal()
         terminal.read_until(b"ready")
@@ -185,10 +241,12 @@ class OnTerminal(unittest.TestCase):
         self.assertFalse(fcntl.fcntl(terminal.other_end, fcntl.F_GETFL) & os.O_NONBLOCK)
 
     def test_the_status_and_the_last_words_of_a_command_that_ends_are_shown(self):
-        terminal = Terminal(command="yes noise | head -n 9; seq 2000; echo gone; exit 150")
+        terminal = Terminal(command="yes noise | head -n 9; seq 2000; echo gone; "
+                                    r"printf '\033]0;owned\007\302\2331m\n'; exit 150")
         self.assertEqual(terminal.status(), 150)
         last_words = terminal.shown[terminal.shown.index(b"gone"):]
         self.assertIn(b"ended with status 150", last_words)
+        self.assertIn(b"\n?]0;owned??1m\r\n", last_words)
         self.assertNotIn(b"noise", terminal.shown)
 
     def test_a_command_that_wants_the_terminal_fails_instead_of_waiting_unseen(self):
