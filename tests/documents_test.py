@@ -19,6 +19,8 @@ PAGES = [ROOT / "README.md", *sorted(ROOT.glob("docs/*.md"))]
 FIGURES = [
     ("packaging/man/panel-emulator.1", r"more\nthan (\d+) messages in a second",
      "emulator/web/WebSession.cpp", r"mostMessagesPerSecond = (\d+)"),
+    ("packaging/man/panel-emulator.1", r"header of more than (\d+) bytes",
+     "emulator/web/WebSession.cpp", r"mostHeaderBytes = (\d+)"),
     ("packaging/man/panel-emulator.1", r"At most (\d+) connections",
      "emulator/web/WebServer.cpp", r"mostSessions = (\d+)"),
     ("packaging/man/panel-emulator.1", r"The default is (\d+) seconds",
