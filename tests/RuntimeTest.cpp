@@ -137,7 +137,7 @@ FRESH_TEST(Runtime, AFileIsReadLineByLineWhateverItHolds) {
     EXPECT_FALSE(TextFile(path.c_str()).isOpen());
     EXPECT_EQ(TextFile(path.c_str()).nextLine(), std::nullopt);
     for (const char *other : {"/etc/resolv.conf", "/proc/sys/kernel/hostname"})
-        EXPECT_NONFATAL_FAILURE(std::ifstream file(other), "the machine's own file");
+        EXPECT_NONFATAL_FAILURE(const std::ifstream file(other), "the machine's own file");
 }
 
 FRESH_TEST(Runtime, TrimmingStripsBothEnds) {

@@ -113,9 +113,9 @@ void TerminalKeys::takeSequenceByte(char byte, std::vector<Event> &events) {
     const std::size_t begin = sequence.find_last_of(escapeByte);
     const std::size_t length = sequence.size() - begin;
     const char introducer = sequence[begin + 1];
-    const bool isComplete = introducer == '['   ? length > 2 && isFinal(byte)
-                            : introducer == 'O' ? length > 2
-                                                : !isInString();
+    const bool isControl = introducer == '[', isShort = introducer == 'O';
+    const bool isComplete = (isControl && length > 2 && isFinal(byte)) || (isShort && length > 2) ||
+                            (!isControl && !isShort && !isInString());
     if (isComplete || sequence.size() == longestSequence)
         finishSequence(events);
 }
