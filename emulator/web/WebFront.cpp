@@ -18,7 +18,11 @@ constexpr std::chrono::milliseconds frameTime{50};
 constexpr std::chrono::seconds repeatTime{1};
 constexpr std::streamoff mostRecorded = 1 << 20; // bytes: many hours of pressing keys
 constexpr std::string_view pressWord = "press ";
+constexpr std::string_view holdWord = "hold";
 constexpr std::string_view releaseWord = "release";
+// A page says twice a second that its key is held. A connection that has stalled, or a page that
+// hangs, must not keep the key down.
+constexpr std::chrono::milliseconds holdTime{1500};
 
 // The character in place of a byte that is not printable has the dots of any such byte.
 constexpr const char *noCharacter = "\uFFFD";
@@ -49,6 +53,8 @@ std::optional<int> WebFront::look(TimePoint now) {
         recorder.look(now);
     if (recorder.isBetweenKeys())
         recorded = recording.tellp();
+    if (now >= holdUntil)
+        letGo();
     finger.look(now);
     load.look(now);
     if (now >= showAgain && server.hasPages()) {
@@ -63,9 +69,9 @@ std::optional<int> WebFront::look(TimePoint now) {
 }
 
 std::optional<TimePoint> WebFront::wakeAt() const {
-    std::optional<TimePoint> wake = finger.wakeAt();
+    TimePoint wake = std::min(finger.wakeAt().value_or(TimePoint::max()), holdUntil);
     if (server.hasPages())
-        wake = std::min(wake.value_or(TimePoint::max()), showAgain);
+        wake = std::min(wake, showAgain);
     return wake;
 }
 
@@ -113,9 +119,13 @@ std::string WebFront::state() const {
 }
 
 bool WebFront::take(const WebSession &page, std::string_view message) {
-    if (message == releaseWord) {
-        if (presser == &page)
-            finger.release(Clock::now());
+    const TimePoint now = Clock::now();
+    if (message == releaseWord || message == holdWord) {
+        if (presser != &page || holdUntil == TimePoint::max())
+            return true;
+        holdUntil = message == holdWord ? now + holdTime : TimePoint::max();
+        if (message == releaseWord)
+            finger.release(now);
         return true;
     }
     const auto *key = std::find_if(keys.begin(), keys.end(), [&](const KeyTraits &each) {
@@ -124,17 +134,22 @@ bool WebFront::take(const WebSession &page, std::string_view message) {
     if (key == keys.end())
         return false;
     if (use == Use::operate && ending.empty()) {
-        finger.press(key->key, Clock::now());
+        finger.press(key->key, now);
         presser = &page;
+        holdUntil = now + holdTime;
     }
     return true;
 }
 
 void WebFront::leave(const WebSession &page) {
-    if (presser != &page)
-        return;
+    if (presser == &page)
+        letGo();
+}
+
+void WebFront::letGo() {
     finger.lift();
     presser = nullptr;
+    holdUntil = TimePoint::max();
 }
 
 bool WebFront::isRecording() {

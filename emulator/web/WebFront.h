@@ -39,6 +39,7 @@ class WebFront : public Operator, private WebService {
     bool take(const WebSession &page, std::string_view message) override;
     void leave(const WebSession &page) override;
 
+    void letGo();
     [[nodiscard]] bool isRecording();
     [[nodiscard]] std::string programState() const;
     [[nodiscard]] std::string journey() const;
@@ -47,7 +48,8 @@ class WebFront : public Operator, private WebService {
     Keypad &keypad;
     Use use;
     Finger finger;
-    const WebSession *presser = nullptr; // whose key is down
+    const WebSession *presser = nullptr;    // whose key is down
+    TimePoint holdUntil = TimePoint::max(); // unless that page says that it is still held
     LineLoad load;
     std::ostringstream recording; // of all that has been done since the start
     Recorder recorder;

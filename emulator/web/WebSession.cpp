@@ -23,7 +23,7 @@ constexpr int mostMessagesPerSecond = 100;
 constexpr int sendBufferBytes = 16'384; // what is older than that in states is of no use
 
 constexpr const char *contentPolicy =
-    "default-src 'none'; script-src 'self'; style-src 'self'; connect-src 'self'; "
+    "default-src 'none'; img-src data:; script-src 'self'; style-src 'self'; connect-src 'self'; "
     "base-uri 'none'; form-action 'none'; frame-ancestors 'none'";
 
 std::string_view view(beast::string_view text) {

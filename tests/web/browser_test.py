@@ -161,6 +161,7 @@ class InBrowser(unittest.TestCase):
         for number, said in ((signal.SIGSTOP, "connection is lost"), (signal.SIGCONT, "Connected")):
             panel.process.send_signal(number)
             other.expect_text("notice", said)
+            self.assertEqual(other.key("up").is_enabled(), number == signal.SIGCONT)
 
     def test_a_lost_connection_comes_back_and_the_end_is_said_with_the_status(self):
         _, page = self.start(command=["sh", "-c", FAULT])

@@ -8,6 +8,7 @@ import json
 import os
 import random
 import sys
+import time
 import unittest
 
 import websocket
@@ -101,9 +102,24 @@ class Limits(unittest.TestCase):
         second.send("press down")
         wait_for(first, down="down", counted="down", polls=2)
         first.send("release")
-        wait_for(first, down="down", counted="down", polls=7)
+        first.send("hold")
+        for polls in range(5, 20, 3):
+            second.send("hold")
+            wait_for(first, down="down", counted="down", polls=polls)
         second.sock.close()
         wait_for(first, down=None, polls=0)
+
+    def test_a_key_comes_up_soon_after_the_last_word_of_its_page(self):
+        page, other = self.panel.open(), self.panel.open()
+        page.send("press up")
+        wait_for(other, down="up", polls=4)
+        page.send("hold")
+        last_word = time.monotonic()
+        wait_for(other, down=None)
+        self.assertTrue(1.4 < time.monotonic() - last_word < 2)
+        page.send("hold")  # too late: the key stays up
+        with self.assertRaises(AssertionError):
+            wait_for(other, 0.5, down="up")
 
 
 if __name__ == "__main__":

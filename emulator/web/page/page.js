@@ -137,6 +137,9 @@ function letGo() {
   release(presser);
 }
 
+// The emulator lets a key go of which it hears nothing for a second and a half.
+setInterval(() => presser !== null && send("hold"), 500);
+
 // A drawn key that has the keyboard's focus is pressed by Enter and the space bar, as any button.
 function keyOf(event) {
   if (event.ctrlKey || event.altKey || event.metaKey)
@@ -203,7 +206,7 @@ element("save").addEventListener("click", async () => {
 });
 
 async function fetched(name, kind) {
-  const answer = await fetch(name);
+  const answer = await fetch(name, { signal: AbortSignal.timeout(patience) });
   if (!answer.ok)
     throw new Error(answer.status);
   return answer[kind]();
@@ -227,6 +230,13 @@ function connectAgain() {
   presser = null;
   if (state?.ending)
     return;
+  for (const button of keyButtons) {
+    button.classList.remove("down");
+    button.disabled = true;
+  }
+  for (const field of ["held", "percent", "bytes", "program"])
+    element(field).textContent = "";
+  element("load").value = 0;
   notice("The connection is lost. Trying again … If the emulator was ended, start it anew and " +
          "open the address that it prints.", true);
   setTimeout(connect, retryTime);
