@@ -74,6 +74,7 @@ std::string described(int status) {
 
 Emulator::Emulator(const Options &options, std::optional<Journey> journey)
     : loop([this] { turn(); }), line(options.fast, options.trace),
+      recording(options.record ? std::make_unique<LateFile>(*options.record) : nullptr),
       keypad([this](Key key) { line.answer(traits(key).code); }),
       arrivals(loop, line.descriptor(), [] {}), output(loop), lastTurn(Clock::now()) {
     loop.onSignals(handledSignals(), [this](int number) { handleSignal(number); });
@@ -83,16 +84,16 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
     const Use use = isJourney ? Use::watch : Use::operate;
     if (isJourney)
         journeyOperator = std::make_unique<JourneyOperator>(
-            loop, std::move(*journey), JourneyPlayer::Panel{display, keypad}, std::cout,
-            options.limit, options.pictures);
+            loop, std::move(*journey), JourneyPlayer::Panel{display, keypad},
+            options.isDrawn() ? said : std::cout, options.limit, options.pictures);
     if (options.web)
         webFront = std::make_unique<WebFront>(loop, *options.web, display, keypad, use);
     if (options.isDrawn())
         front = std::make_unique<TerminalFront>(loop, display, keypad, use);
     if (options.isDrawn() || !isJourney)
         commandOutput = output.open();
-    if (options.record)
-        recorder = std::make_unique<Recorder>(recording.emplace(*options.record), display, keypad);
+    if (recording)
+        recorder = std::make_unique<Recorder>(*recording, display, keypad);
     if (webFront)
         announce(webFront->webServer());
     // The recorder looks before anybody presses the next key.
@@ -248,6 +249,7 @@ void Emulator::report() {
                   << '\n';
     }
     line.finishTrace();
+    std::cout << said.str();
     if (!std::cout.flush())
         throw std::runtime_error("cannot write to standard output");
 }

@@ -14,6 +14,7 @@
 #include "emulator/web/WebFront.h"
 
 #include <memory>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -46,13 +47,14 @@ class Emulator {
     Loop loop;
     Display display;
     Line line;
+    std::unique_ptr<LateFile> recording;
+    std::ostringstream said; // by a journey while the panel is drawn
     Keypad keypad;
     Readable arrivals; // on the line
     CommandOutput output;
     std::unique_ptr<JourneyOperator> journeyOperator;
     std::unique_ptr<TerminalFront> front;
     std::unique_ptr<WebFront> webFront;
-    std::optional<LateFile> recording;
     std::unique_ptr<Recorder> recorder;
     std::vector<Operator *> operators; // those of the above that exist, until all is over
     std::unique_ptr<ChildProcess> command;

@@ -32,7 +32,11 @@ boost::asio::ip::tcp::endpoint parseEndpoint(const std::string &text) {
         throw std::invalid_argument("'" + text +
                                     "' is not an [ADDRESS:]PORT for --web, such as "
                                     "8080, 127.0.0.1:8080 or [::1]:8080; names are not looked up");
-    if (parsed.is_multicast() || parsed == boost::asio::ip::address_v4::broadcast())
+    namespace ip = boost::asio::ip;
+    const bool isMapped = parsed.is_v6() && parsed.to_v6().is_v4_mapped();
+    const ip::address plain =
+        isMapped ? ip::make_address_v4(ip::v4_mapped, parsed.to_v6()) : parsed;
+    if (plain.is_multicast() || plain == ip::address_v4::broadcast())
         throw std::invalid_argument("no page can be opened at " + address);
     return {parsed,
             static_cast<unsigned short>(parseNumber(hasAddress ? text.substr(colon + 1) : text, 0U,
@@ -83,15 +87,22 @@ constexpr std::array optionKinds{
                [](Options &options, const char *) { options.help = true; }},
 };
 
+// Where a file will be that is not there yet: behind its links.
+std::filesystem::path nameOfNewFile(std::filesystem::path path) {
+    constexpr int mostLinks = 40;
+    for (int links = 0; links < mostLinks && is_symlink(path); links++)
+        path = path.parent_path() / read_symlink(path);
+    return weakly_canonical(absolute(path));
+}
+
 // Of a file that is not there yet, the name counts.
 bool isSameFile(const std::string &one, const std::string &other) {
-    namespace fs = std::filesystem;
     struct stat first{}, second{};
     const bool isThere = stat(one.c_str(), &first) == 0;
     if (isThere != (stat(other.c_str(), &second) == 0))
         return false;
     if (!isThere)
-        return fs::weakly_canonical(fs::absolute(one)) == fs::weakly_canonical(fs::absolute(other));
+        return nameOfNewFile(one) == nameOfNewFile(other);
     return S_ISREG(first.st_mode) && first.st_dev == second.st_dev && first.st_ino == second.st_ino;
 }
 

@@ -18,7 +18,7 @@ class Archive:
     def __init__(self):
         self.descriptor = os.memfd_create("box")
         self.tar = tarfile.open(fileobj=os.fdopen(os.dup(self.descriptor), "wb"), mode="w",
-                                encoding="utf-8", errors="surrogateescape")
+                                format=tarfile.GNU_FORMAT, encoding="utf-8", errors="surrogateescape")
 
     def finish(self):
         """Returns the descriptor of the archive, which is to be read from its beginning."""
@@ -69,6 +69,8 @@ def open_command(command):
         descriptor = os.open(command, os.O_RDONLY | os.O_NONBLOCK)
     except (FileNotFoundError, NotADirectoryError):
         end_with(NO_COMMAND, f"{command} does not exist")
+    except OSError as fault:
+        end_with(NO_RUN, f"{command} cannot be run: {fault.strerror}")
     mode = os.fstat(descriptor).st_mode
     if not stat.S_ISREG(mode):
         end_with(NO_RUN, f"{command} cannot be run: it is not a regular file")

@@ -9,19 +9,23 @@
 
 namespace emulator {
 
-LateFile::LateFile(const std::string &itsPath)
-    : std::ostream(nullptr), path(itsPath), buffer(itsPath) {
+LateFile::LateFile(const std::string &path) : std::ostream(nullptr), buffer(path) {
     const int created = open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
+    int error = created < 0 && errno != EEXIST ? errno : 0;
+    std::error_code ignored;
     if (created >= 0) {
         close(created);
         unlink(path.c_str());
-    } else if (std::filesystem::is_directory(path)) {
-        errno = EISDIR;
-    } else if (errno == EEXIST && (access(path.c_str(), W_OK) == 0 || errno == ENOENT)) {
-        errno = 0; // ENOENT for a link to a file that is not there yet
+    } else if (error == 0 && std::filesystem::is_directory(path, ignored)) {
+        error = EISDIR;
+    } else if (error == 0 && access(path.c_str(), W_OK) != 0 && errno != ENOENT) {
+        error = errno; // but ENOENT, for a link to a file that is not there yet
     }
-    if (created < 0 && errno != 0)
-        throw std::system_error(errno, std::generic_category(), "cannot write " + path);
+    if (error != 0)
+        throw std::system_error(error, std::generic_category(), "cannot write " + path);
+    // To open a pipe may take until somebody reads it, and there is nothing in it to be kept.
+    if (std::filesystem::is_other(path, ignored))
+        buffer.openOnce();
     rdbuf(&buffer);
 }
 

@@ -10,7 +10,8 @@ namespace emulator {
 /// ends before then, such as a command that cannot be run, costs nobody an older recording.
 class LateFile : public std::ostream {
   public:
-    /// Throws std::runtime_error if nothing can be written to the file. Creates none.
+    /// Throws std::runtime_error if nothing can be written to the file. Creates none. What is no
+    /// ordinary file is opened at once.
     explicit LateFile(const std::string &path);
 
     /// To be called at the end. Throws std::runtime_error when not all could be written of
@@ -21,6 +22,10 @@ class LateFile : public std::ostream {
     class Buffer : public std::filebuf {
       public:
         explicit Buffer(std::string itsPath) : path(std::move(itsPath)) {}
+        void openOnce() {
+            if (!is_open())
+                open(path, std::ios::out);
+        }
 
       protected:
         int_type overflow(int_type character) override {
@@ -33,15 +38,9 @@ class LateFile : public std::ostream {
         }
 
       private:
-        void openOnce() {
-            if (!is_open())
-                open(path, std::ios::out);
-        }
-
         std::string path;
     };
 
-    std::string path;
     Buffer buffer;
 };
 

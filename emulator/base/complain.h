@@ -12,7 +12,8 @@ inline std::string masked(const std::string &text) {
     std::string result;
     for (const char c : text) {
         const auto byte = static_cast<unsigned char>(c);
-        const bool isSecondHalf = !result.empty() && result.back() == '\xC2' && byte < 0xA0;
+        const bool isSecondHalf =
+            !result.empty() && result.back() == '\xC2' && byte >= 0x80 && byte < 0xA0;
         if (isSecondHalf)
             result.back() = '?';
         else if ((byte < ' ' && c != '\n' && c != '\t') || byte == 0x7F)

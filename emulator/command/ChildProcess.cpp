@@ -14,6 +14,7 @@
 #include <cstring>
 #include <ctime>
 #include <fstream>
+#include <set>
 #include <system_error>
 
 namespace emulator {
@@ -58,13 +59,17 @@ FileDescriptor openProcess(pid_t pid) {
     return FileDescriptor(static_cast<int>(syscall(SYS_pidfd_open, pid, 0)));
 }
 
-// Sends a signal to the command's group and to this process's children. What has left the group
-// becomes one of them when its parent ends.
-void signalAll(pid_t command, int number) {
-    kill(-command, number);
+// Sends a signal to this process's children, and says which they are. What has left the command's
+// group becomes one of them when its parent ends.
+std::set<pid_t> signalChildren(int number, const std::set<pid_t> &except) {
+    std::set<pid_t> all;
     std::ifstream children("/proc/thread-self/children");
-    for (pid_t child = 0; children >> child;)
-        kill(child, number);
+    for (pid_t child = 0; children >> child;) {
+        all.insert(child);
+        if (except.count(child) == 0)
+            kill(child, number);
+    }
+    return all;
 }
 
 // Waits until the command and whatever it has started have ended, and ends them at SIGTERM as far
@@ -72,6 +77,7 @@ void signalAll(pid_t command, int number) {
 int waitForAll(pid_t command, const sigset_t &awaited) {
     std::optional<int> status;
     std::optional<TimePoint> giveUp;
+    std::set<pid_t> told; // to end
     for (;;) {
         const int signal =
             giveUp ? sigtimedwait(&awaited, nullptr, &endingLook) : sigwaitinfo(&awaited, nullptr);
@@ -84,10 +90,15 @@ int waitForAll(pid_t command, const sigset_t &awaited) {
         if (status && isNoneLeft)
             return *status;
         if (!giveUp && (signal == SIGTERM || status)) {
-            signalAll(command, SIGTERM);
+            kill(-command, SIGTERM);
+            told.insert(command);
             giveUp = Clock::now() + gracePeriod;
-        } else if (giveUp && Clock::now() >= *giveUp) {
-            signalAll(command, SIGKILL);
+        }
+        if (giveUp && Clock::now() < *giveUp) {
+            told = signalChildren(SIGTERM, told);
+        } else if (giveUp) {
+            kill(-command, SIGKILL);
+            signalChildren(SIGKILL, {});
         }
         if (giveUp && Clock::now() >= *giveUp + killPeriod)
             kill(getpid(), SIGKILL); // which tells the emulator
@@ -143,8 +154,11 @@ ChildProcess::ChildProcess(Loop &loop, std::vector<std::string> words, int outpu
     if (guard == 0)
         guardCommand(words, output, report.get(), self);
     report.reset();
-    if (guard < 0 || read(pidReport.get(), &command, sizeof command) != sizeof command ||
-        command < 0)
+    ssize_t count = 0;
+    do
+        count = read(pidReport.get(), &command, sizeof command);
+    while (count < 0 && errno == EINTR); // as when the terminal's size changes
+    if (guard < 0 || count != sizeof command || command < 0)
         throw std::system_error(errno, std::generic_category(), "cannot start a process");
     commandEnd = openProcess(command);
     guardEnd = openProcess(guard);

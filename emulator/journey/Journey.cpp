@@ -1,5 +1,6 @@
 #include "emulator/journey/Journey.h"
 
+#include "emulator/base/complain.h"
 #include "emulator/journey/words.h"
 
 #include <algorithm>
@@ -36,8 +37,7 @@ bool getLine(std::istream &input, std::string &line) {
 bool isText(std::string_view line) {
     if (!line.empty() && line.back() == '\r')
         line.remove_suffix(1); // some editors end lines with CR LF
-    return std::all_of(line.begin(), line.end(),
-                       [](char c) { return static_cast<unsigned char>(c) >= ' ' || c == '\t'; });
+    return masked(std::string(line)) == line;
 }
 
 // Some editors begin a text with this, which nobody sees.

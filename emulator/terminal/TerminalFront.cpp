@@ -37,9 +37,6 @@ constexpr int countsAt = 8;
 constexpr int helpAt = 10;
 constexpr int wordAt = 11;
 
-constexpr const char *mouseOn = "\033[?1000h\033[?1006h";
-constexpr const char *mouseOff = "\033[?1006l\033[?1000l";
-
 struct DrawnKey {
     Cell at;
     const char *label;
@@ -83,20 +80,14 @@ FileDescriptor openKeyboard() {
 } // namespace
 
 TerminalFront::TerminalFront(Loop &loop, const Display &itsDisplay, Keypad &itsKeypad, Use itsUse)
-    : keyboard(openKeyboard()), display(itsDisplay), keypad(itsKeypad), use(itsUse),
-      input(loop, keyboard.get(), [this] { readInput(); }), finger(itsKeypad), load(Clock::now()) {
+    : screen(itsUse == Use::operate), keyboard(openKeyboard()), display(itsDisplay),
+      keypad(itsKeypad), use(itsUse), input(loop, keyboard.get(), [this] { readInput(); }),
+      finger(itsKeypad), load(Clock::now()) {
     if (has_colors()) {
         start_color();
         use_default_colors();
         init_pair(glassColours, COLOR_BLACK, COLOR_GREEN);
     }
-    if (use == Use::operate)
-        screen.send(mouseOn);
-}
-
-TerminalFront::~TerminalFront() {
-    if (use == Use::operate)
-        screen.send(mouseOff);
 }
 
 std::optional<int> TerminalFront::look(TimePoint now) {
@@ -175,13 +166,9 @@ void TerminalFront::act(const TerminalKeys::Other &, TimePoint) {
 }
 
 void TerminalFront::stopWith(const std::function<void()> &stop) {
-    if (use == Use::operate)
-        screen.send(mouseOff);
     screen.leave();
     stop();
     screen.enter();
-    if (use == Use::operate)
-        screen.send(mouseOn);
     drawAgain = {};
 }
 

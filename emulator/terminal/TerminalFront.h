@@ -28,7 +28,6 @@ class TerminalFront : public Operator {
     TerminalFront(Loop &loop, const Display &display, Keypad &keypad, Use use);
     TerminalFront(const TerminalFront &) = delete;
     TerminalFront &operator=(const TerminalFront &) = delete;
-    ~TerminalFront() override;
 
     /// Ends with status 0 when the operator quits or the operator's terminal goes away; throws
     /// std::runtime_error when the terminal of a person who only watches does.

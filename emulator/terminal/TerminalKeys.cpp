@@ -14,7 +14,9 @@ constexpr char escapeByte = '\033';
 // how long a sequence or a pasted text may pause.
 constexpr std::chrono::milliseconds loneEscape{150};
 constexpr std::chrono::milliseconds brokenSequence{250};
-constexpr std::size_t longestSequence = 32;
+constexpr std::chrono::seconds brokenPaste{3};
+constexpr std::size_t longestSequence = 32; // that is kept
+constexpr std::string_view stringIntroducers = "]P_^X";
 constexpr std::string_view pasteBegins = "[200~", pasteEnds = "[201~";
 
 // The sequences that terminals in use send after ESC for these keys.
@@ -72,7 +74,7 @@ std::vector<TerminalKeys::Event> TerminalKeys::take(std::string_view bytes, Time
 std::vector<TerminalKeys::Event> TerminalKeys::look(TimePoint now) {
     std::vector<Event> events;
     if (const std::optional<TimePoint> end = wakeAt(); end && now >= *end) {
-        if (isEscapes())
+        if (isEscapes() && !isPasting)
             events.insert(events.end(), sequence.size(), Tap{Key::escape});
         sequence.clear();
         isPasting = false;
@@ -83,6 +85,8 @@ std::vector<TerminalKeys::Event> TerminalKeys::look(TimePoint now) {
 std::optional<TimePoint> TerminalKeys::wakeAt() const {
     if (sequence.empty() && !isPasting)
         return std::nullopt;
+    if (isPasting)
+        return lastByte + brokenPaste;
     return lastByte + (isEscapes() ? loneEscape : brokenSequence);
 }
 
@@ -96,7 +100,7 @@ void TerminalKeys::takeByte(char byte, std::vector<Event> &events) {
     } else if (byte == escapeByte) {
         // Two may be the start of a key with Alt, which some terminals send so.
         if (sequence.size() == 2 && sequence[1] == escapeByte)
-            events.emplace_back(Tap{Key::escape});
+            tapEscape(events);
         else if (sequence.size() > 1)
             sequence.clear();
         if (sequence.size() < 2)
@@ -108,7 +112,19 @@ void TerminalKeys::takeByte(char byte, std::vector<Event> &events) {
     }
 }
 
+void TerminalKeys::tapEscape(std::vector<Event> &events) const {
+    if (!isPasting)
+        events.emplace_back(Tap{Key::escape});
+}
+
 void TerminalKeys::takeSequenceByte(char byte, std::vector<Event> &events) {
+    // Escape was pressed while the terminal sent a string.
+    if (sequence.size() == 2 && stringIntroducers.find(byte) != std::string_view::npos) {
+        tapEscape(events);
+        sequence.pop_back();
+    }
+    if (sequence.size() == longestSequence)
+        sequence.pop_back(); // it is none of those that are known, but goes on
     sequence += byte;
     const std::size_t begin = sequence.find_last_of(escapeByte);
     const std::size_t length = sequence.size() - begin;
@@ -116,14 +132,13 @@ void TerminalKeys::takeSequenceByte(char byte, std::vector<Event> &events) {
     const bool isControl = introducer == '[', isShort = introducer == 'O';
     const bool isComplete = (isControl && length > 2 && isFinal(byte)) || (isShort && length > 2) ||
                             (!isControl && !isShort && !isInString());
-    if (isComplete || sequence.size() == longestSequence)
+    if (isComplete)
         finishSequence(events);
 }
 
 // What a terminal answers to a question, for example about its colours, is a string of any length.
 bool TerminalKeys::isInString() const {
-    constexpr std::string_view introducers = "]P_^X";
-    return sequence.size() > 1 && introducers.find(sequence[1]) != std::string_view::npos;
+    return sequence.size() > 1 && stringIntroducers.find(sequence[1]) != std::string_view::npos;
 }
 
 // A string ends with BEL or with ESC \, and any other sequence ends it, too.

@@ -39,6 +39,7 @@ class TerminalKeys {
   private:
     [[nodiscard]] bool isEscapes() const;
     [[nodiscard]] bool isInString() const;
+    void tapEscape(std::vector<Event> &events) const;
     void takeByte(char byte, std::vector<Event> &events);
     void takeSequenceByte(char byte, std::vector<Event> &events);
     void takeStringByte(char byte, std::vector<Event> &events);

@@ -39,7 +39,7 @@ const char *sequence(const char *name) {
 
 void prepare() {
     state.length = 0;
-    tputs("\033[?1006l\033[?1000l", 1, keep); // mouse reports off
+    tputs("\033[?2004l\033[?1006l\033[?1000l", 1, keep); // reports of pastes and the mouse off
     for (const char *name : {"sgr0", "cnorm", "rmkx", "rmcup"})
         if (const char *value = sequence(name))
             tputs(value, 1, keep);

@@ -22,9 +22,12 @@ namespace {
 constexpr int mostLines = 100;
 constexpr int mostColumns = 200;
 
+constexpr const char *pasteOn = "\033[?2004h", *pasteOff = "\033[?2004l";
+constexpr const char *mouseOn = "\033[?1000h\033[?1006h", *mouseOff = "\033[?1006l\033[?1000l";
+
 } // namespace
 
-TerminalScreen::TerminalScreen() {
+TerminalScreen::TerminalScreen(bool itHasMouse) : hasMouse(itHasMouse) {
     const char *name = ttyname(STDOUT_FILENO);
     terminal = FileDescriptor(
         name == nullptr ? -1 : open(name, O_WRONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
@@ -42,15 +45,18 @@ TerminalScreen::TerminalScreen() {
     setInput();
     resize();
     curs_set(0);
+    setModes();
 }
 
 TerminalScreen::~TerminalScreen() {
-    if (!isReady()) {
-        tcflush(terminal.get(), TCOFLUSH); // what nobody reads would delay the end
-        pending.clear();
-    }
     leave();
     delscreen(drawing);
+}
+
+void TerminalScreen::setModes() {
+    pending += pasteOn;
+    if (hasMouse)
+        pending += mouseOn;
 }
 
 // Keys come at once and are not echoed. Ctrl-S has no meaning here, because a stopped terminal
@@ -82,11 +88,6 @@ void TerminalScreen::refresh() {
     push();
 }
 
-void TerminalScreen::send(const std::string &sequence) {
-    pending += sequence;
-    push();
-}
-
 void TerminalScreen::collect() {
     std::fflush(written.get());
     const int memory = fileno(written.get());
@@ -105,6 +106,13 @@ void TerminalScreen::resize() {
 }
 
 void TerminalScreen::leave() {
+    if (!isReady()) {
+        tcflush(terminal.get(), TCOFLUSH); // what nobody reads would delay the end
+        pending.clear();
+    }
+    pending += pasteOff;
+    if (hasMouse)
+        pending += mouseOff;
     endwin();
     collect();
     push();
@@ -114,6 +122,7 @@ void TerminalScreen::leave() {
 void TerminalScreen::enter() {
     setInput();
     resize();
+    setModes();
     wrefresh(curscr); // the whole screen again
     collect();
 }

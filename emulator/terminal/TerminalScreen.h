@@ -19,9 +19,10 @@ namespace emulator {
 /// it.
 class TerminalScreen {
   public:
-    /// Takes over the terminal of standard input and output. Throws std::runtime_error if it cannot
-    /// be opened, or ncurses cannot draw on it.
-    TerminalScreen();
+    /// Takes over the terminal of standard input and output, which reports pasted texts as such
+    /// and, if `hasMouse`, the mouse. Throws std::runtime_error if it cannot be opened, or ncurses
+    /// cannot draw on it.
+    explicit TerminalScreen(bool hasMouse);
     TerminalScreen(const TerminalScreen &) = delete;
     TerminalScreen &operator=(const TerminalScreen &) = delete;
     /// Gives the terminal back. What it has not taken by then is lost.
@@ -31,11 +32,10 @@ class TerminalScreen {
     [[nodiscard]] bool isReady();
     /// Sends what has been drawn.
     void refresh();
-    /// Sends a control sequence behind what has been drawn.
-    void send(const std::string &sequence);
     /// Takes over the terminal's present size, or as much of it as the panel has a use for.
     void resize();
-    /// Gives the terminal back for a while, and takes it over again.
+    /// Gives the terminal back for a while, and takes it over again. What it has not taken yet of
+    /// what was drawn is lost.
     void leave();
     void enter();
 
@@ -47,7 +47,9 @@ class TerminalScreen {
     void push();
     void collect();
     void setInput();
+    void setModes();
 
+    bool hasMouse;
     FileDescriptor terminal; // opened anew, because the shell must not get one that does not block
     termios formerSettings{};
     std::unique_ptr<std::FILE, CloseFile> written; // what ncurses has written

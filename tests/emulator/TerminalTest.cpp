@@ -33,9 +33,9 @@ TEST(TerminalKeys, KnowsKeysAndTheMouseAndPassesOverEverythingElse) {
         {"q?", "Q."},
         {"\033[I\033[O\033[5~\033[<64;1;1M\033q\033[1;5C", ""},
         {"\033\033[A\033[A\033\033\033[A", "ux"}, // with Alt, as some terminals send it
-        {"\033[200~q\033[Ad\r\033[201~u", "U"},
-        {"\033]11;rgb:dddd/d\a\033Pd\033\\\033]d\033[B", "d"},
-        {"\033[" + std::string(40, '1') + "A", std::string(11, '.')}, // given up after 32 bytes
+        {"\033[200~q\033[Ad\r\033\033\033d\033[201~u", "U"},
+        {"\033\033]11;rgb:dddd/d\a\033Pd\033\\\033]d\033[B", "xd"},
+        {"\033[" + std::string(40, '1') + "A", ""},
     };
     for (const auto &[bytes, meaning] : cases)
         EXPECT_EQ(letters(TerminalKeys().take(bytes, {})), meaning) << bytes;
@@ -52,9 +52,10 @@ TEST(TerminalKeys, WaitsForTheRestOfASequenceButNotForEver) {
     EXPECT_EQ(letters(keys.take("\033", now)), "");
     EXPECT_EQ(letters(keys.take("[<0;35", now + 140ms)), "");
     EXPECT_EQ(letters(keys.take(";2M", now + 280ms)), "M");
-    for (const char *broken : {"\033[<", "\033]11", "\033[200~dd"}) {
+    for (const auto &[broken, time] : {std::pair("\033[<", 250ms), std::pair("\033]11", 250ms),
+                                       std::pair("\033[200~d\033", 3000ms)}) {
         EXPECT_EQ(letters(keys.take(broken, now)), "");
-        EXPECT_EQ(letters(keys.take("q", now + 250ms)), "Q");
+        EXPECT_EQ(letters(keys.take("q", now + time)), "Q");
     }
     EXPECT_FALSE(keys.wakeAt());
 }
