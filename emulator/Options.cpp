@@ -2,6 +2,7 @@
 
 #include "emulator/base/Number.h"
 #include "emulator/base/helpEntry.h"
+#include "emulator/base/plainAddress.h"
 #include "emulator/journey/StepTable.h"
 
 #include <algorithm>
@@ -32,11 +33,8 @@ boost::asio::ip::tcp::endpoint parseEndpoint(const std::string &text) {
         throw std::invalid_argument("'" + text +
                                     "' is not an [ADDRESS:]PORT for --web, such as "
                                     "8080, 127.0.0.1:8080 or [::1]:8080; names are not looked up");
-    namespace ip = boost::asio::ip;
-    const bool isMapped = parsed.is_v6() && parsed.to_v6().is_v4_mapped();
-    const ip::address plain =
-        isMapped ? ip::make_address_v4(ip::v4_mapped, parsed.to_v6()) : parsed;
-    if (plain.is_multicast() || plain == ip::address_v4::broadcast())
+    const boost::asio::ip::address plain = plainAddress(parsed);
+    if (plain.is_multicast() || plain == boost::asio::ip::address_v4::broadcast())
         throw std::invalid_argument("no page can be opened at " + address);
     return {parsed,
             static_cast<unsigned short>(parseNumber(hasAddress ? text.substr(colon + 1) : text, 0U,

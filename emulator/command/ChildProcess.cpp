@@ -23,7 +23,7 @@ namespace {
 
 constexpr std::chrono::seconds gracePeriod{2};
 constexpr std::chrono::seconds killPeriod{1};
-constexpr timespec endingLook{0, 10'000'000}; // how often to see whether the group is empty
+constexpr timespec endingLook{0, 10'000'000}; // how often to see whether all have ended
 constexpr int cannotRun = 127;
 
 int shellStatus(int raw) {

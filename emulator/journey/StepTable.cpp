@@ -16,8 +16,7 @@ namespace emulator {
 namespace {
 
 constexpr int mostPolls = 100'000;
-constexpr std::size_t longestWalk = 1000; // letters
-constexpr int mostRepeats = 255;          // of a byte
+constexpr int mostRepeats = 255; // of a byte
 
 [[noreturn]] void reject(const std::string &reason) {
     throw std::invalid_argument(reason);
@@ -86,7 +85,7 @@ class Arguments {
         return entry;
     }
     std::string takeLetters() {
-        const std::string letters = takeVisible(longestWalk);
+        const std::string letters = takeVisible(std::string::npos);
         if (letters.empty())
             reject("there are no letters to walk through");
         return letters;

@@ -18,7 +18,7 @@ namespace emulator {
 
 namespace {
 
-// The panel needs 11 lines of 72 columns.
+// The panel needs 12 lines of 72 columns.
 constexpr int mostLines = 100;
 constexpr int mostColumns = 200;
 

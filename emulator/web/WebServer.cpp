@@ -1,5 +1,6 @@
 #include "emulator/web/WebServer.h"
 
+#include "emulator/base/plainAddress.h"
 #include "emulator/web/WebSession.h"
 
 #include <algorithm>
@@ -49,12 +50,7 @@ std::string WebServer::address() const {
 }
 
 bool WebServer::isOpenToOthers() const {
-    using boost::asio::ip::make_address_v4;
-    using boost::asio::ip::v4_mapped;
-    const auto address = acceptor.local_endpoint().address();
-    const bool isMapped = address.is_v6() && address.to_v6().is_v4_mapped();
-    return !(isMapped ? make_address_v4(v4_mapped, address.to_v6()).is_loopback()
-                      : address.is_loopback());
+    return !plainAddress(acceptor.local_endpoint().address()).is_loopback();
 }
 
 bool WebServer::hasPages() const {

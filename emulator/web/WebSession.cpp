@@ -70,7 +70,6 @@ void WebSession::start() {
 }
 
 void WebSession::refuseHeader() {
-    isTooLong = true;
     respond(http::status::request_header_fields_too_large,
             {"text/plain; charset=utf-8",
              "The browser has sent a header of more than " + std::to_string(mostHeaderBytes) +
@@ -125,8 +124,9 @@ void WebSession::respond(http::status status, WebService::Resource resource) {
     response.body() = std::move(resource.body);
     response.prepare_payload();
     socket.next_layer().expires_after(answerTime);
+    const bool isRead = status != http::status::request_header_fields_too_large;
     http::async_write(socket.next_layer(), response,
-                      then(isTooLong ? &WebSession::passOverRest : &WebSession::close));
+                      then(isRead ? &WebSession::close : &WebSession::passOverRest));
 }
 
 void WebSession::openPage() {

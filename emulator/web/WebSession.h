@@ -21,7 +21,8 @@ namespace emulator {
 /// open page, which is shown states and sends messages until one of the two ends it.
 ///
 /// Of the states a page gets the newest whenever it has taken the one before; what comes meanwhile
-/// is left out. Whatever breaks the rules, or takes too long, is closed without a word.
+/// is left out. Whatever breaks the rules, or takes too long, is closed without a word, but for a
+/// header that is too long, which may be no fault of the operator's.
 class WebSession : public std::enable_shared_from_this<WebSession> {
   public:
     using Text = std::shared_ptr<const std::string>;
@@ -70,8 +71,7 @@ class WebSession : public std::enable_shared_from_this<WebSession> {
     Text next;    // to be written
     Text current; // being written
     TimePoint countedSince;
-    int messages = 0;       // since then
-    bool isTooLong = false; // the request
+    int messages = 0; // since then
     bool hasOpened = false;
     bool isLeaving = false;
     bool isClosed = false;

@@ -230,6 +230,10 @@ class OnTerminal(unittest.TestCase):
         terminal.process.send_signal(signal.SIGALRM)
         self.assertEqual(terminal.process.wait(timeout=3), 128 + signal.SIGALRM)
         self.assertTrue(termios.tcgetattr(terminal.other_end)[3] & termios.ECHO)
+        terminal.status()
+        for mode in (b"1000", b"2004"):  # reports of the mouse and of pastes
+            on, off = (terminal.shown.rfind(b"\033[?" + mode + end) for end in (b"h", b"l"))
+            self.assertTrue(0 <= on < off, terminal.shown[-200:])
 
     def test_a_stopped_terminal_does_not_hold_it_up_and_is_given_back_as_it_was(self):
         terminal = Terminal()
