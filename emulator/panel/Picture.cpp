@@ -1,6 +1,6 @@
 #include "emulator/panel/Picture.h"
 
-#include "emulator/panel/Font.h"
+#include "emulator/panel/Glass.h"
 
 #include <algorithm>
 #include <fstream>
@@ -10,15 +10,11 @@ namespace emulator {
 
 namespace {
 
+using namespace glass;
+
 // All measures of the SVG are in dots of the display.
-constexpr int cellPitch = glyphColumns + 1;
-constexpr int rowPitch = 10;
-constexpr int glyphRows = 8;
 constexpr int bezel = 5;
-constexpr int margin = 4;
 constexpr int textLeft = bezel + margin;
-constexpr int textWidth = Display::visibleColumns * cellPitch - 1;
-constexpr int textHeight = rowPitch + glyphRows;
 constexpr int width = textWidth + 2 * textLeft;
 constexpr int height = textHeight + 2 * textLeft;
 constexpr int pixelsPerDot = 4;
@@ -105,17 +101,19 @@ std::string Picture::svg() const {
         "\" height=\"" + number(height * pixelsPerDot) + "\" viewBox=\"0 0 " + number(width) + " " +
         number(height) + "\">\n<title>" + escaped(printable(rows[0] + "|" + rows[1])) +
         "</title>\n" + rectangle(0, 0, width, height, "rx=\"3\" fill=\"#22262b\"/>\n") +
-        rectangle(bezel, bezel, width - 2 * bezel, height - 2 * bezel, "fill=\"#a9c23f\"/>\n") +
-        "<path d=\"" + cells +
-        "\" stroke=\"#a0b83a\" stroke-width=\"8\" stroke-dasharray=\"5 1\"/>\n";
+        rectangle(bezel, bezel, width - 2 * bezel, height - 2 * bezel,
+                  "fill=\"" + std::string(background) + "\"/>\n") +
+        "<path d=\"" + cells + "\" stroke=\"" + blankDot +
+        "\" stroke-width=\"8\" stroke-dasharray=\"5 1\"/>\n";
     if (!dots.empty()) {
         // Strokes run along the middle of their dots.
-        svg += "<path transform=\"translate(.05 .5)\" d=\"" + dots +
-               "\" stroke=\"#1d2a10\" stroke-width=\".9\" stroke-dasharray=\".9 .1\"/>\n";
+        svg += "<path transform=\"translate(.05 .5)\" d=\"" + dots + "\" stroke=\"" + darkDot +
+               "\" stroke-width=\".9\" stroke-dasharray=\".9 .1\"/>\n";
     }
     if (cursor) {
         svg += rectangle(textLeft + cursor->column * cellPitch, textLeft + cursor->row * rowPitch,
-                         glyphColumns, glyphRows, "fill=\"#1d2a10\" fill-opacity=\".45\">") +
+                         glyphColumns, glyphRows,
+                         "fill=\"" + std::string(darkDot) + "\" fill-opacity=\".45\">") +
                "<animate attributeName=\"visibility\" values=\"visible;hidden\" dur=\"0.8s\" "
                "calcMode=\"discrete\" repeatCount=\"indefinite\"/></rect>\n";
     }
