@@ -2,6 +2,7 @@
 
 #include "emulator/base/complain.h"
 #include "emulator/panel/Picture.h"
+#include "emulator/web/qrCode.h"
 
 #include <algorithm>
 #include <csignal>
@@ -12,6 +13,7 @@
 #include <iostream>
 #include <set>
 #include <stdexcept>
+#include <unistd.h>
 #include <utility>
 
 namespace emulator {
@@ -43,11 +45,19 @@ std::vector<int> handledSignals() {
 
 // The address has a line of its own, so that other programs can read it.
 void announce(const WebServer &server) {
-    if (!(std::cout << server.address() << '\n' << std::flush))
+    const std::string watchers = server.addressForOthers(Use::watch).value_or("");
+    if (!(std::cout << server.address(Use::operate) << "\nto watch only: "
+                    << (watchers.empty() ? server.address(Use::watch) : watchers) << '\n'
+                    << std::flush))
         throw std::runtime_error("cannot write the page's address to standard output");
-    if (server.isOpenToOthers())
-        complain("other machines can open this page, too, at this machine's address;\nwhoever has "
-                 "the link stands at the panel, and nothing is encrypted");
+    const std::optional<std::string> link = server.addressForOthers(Use::operate);
+    if (!link)
+        return;
+    complain("other machines can open this page, too, at " +
+             (link->empty() ? "this machine's address" : *link) +
+             "\nwhoever has the link stands at the panel, and nothing is encrypted");
+    if (!link->empty() && isatty(STDERR_FILENO) != 0)
+        std::cerr << qrCode(*link);
 }
 
 std::vector<std::string> withPath(std::vector<std::string> command, const std::string &path) {
@@ -79,7 +89,6 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
       arrivals(loop, line.descriptor(), [] {}), output(loop), lastTurn(Clock::now()) {
     loop.onSignals(handledSignals(), [this](int number) { handleSignal(number); });
     setenv("PANEL_TTY", line.path().c_str(), 1);
-    FileDescriptor commandOutput;
     isJourney = journey.has_value();
     const Use use = isJourney ? Use::watch : Use::operate;
     if (isJourney)
@@ -87,11 +96,12 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
             loop, std::move(*journey), JourneyPlayer::Panel{display, keypad},
             options.isDrawn() ? said : std::cout, options.limit, options.pictures);
     if (options.web)
-        webFront = std::make_unique<WebFront>(loop, *options.web, display, keypad, use);
+        webFront = std::make_unique<WebFront>(
+            loop, *options.web, display, keypad, use,
+            isJourney || options.record ? std::function<void()>() : [this] { startOver(); });
     if (options.isDrawn())
         front = std::make_unique<TerminalFront>(loop, display, keypad, use);
-    if (options.isDrawn() || !isJourney)
-        commandOutput = output.open();
+    isOutputKept = options.isDrawn() || !isJourney;
     if (recording)
         recorder = std::make_unique<Recorder>(*recording, display, keypad);
     if (webFront)
@@ -102,11 +112,22 @@ Emulator::Emulator(const Options &options, std::optional<Journey> journey)
         if (each != nullptr)
             operators.push_back(each);
     }
-    command = std::make_unique<ChildProcess>(loop, withPath(options.command, line.path()),
-                                             commandOutput.get());
-    setenv("PANEL_COMMAND_PID", std::to_string(command->pid()).c_str(), 1);
+    words = withPath(options.command, line.path());
+    startCommand();
     if (journeyOperator)
         journeyOperator->setCommand(options.command.front(), command->pid());
+}
+
+void Emulator::startCommand() {
+    const FileDescriptor printed = isOutputKept ? output.open() : FileDescriptor();
+    command = std::make_unique<ChildProcess>(loop, words, printed.get());
+    setenv("PANEL_COMMAND_PID", std::to_string(command->pid()).c_str(), 1);
+}
+
+// Whoever asks is told by a display that is blank until the new program draws on it.
+void Emulator::startOver() {
+    isStartingOver = true;
+    command->end();
 }
 
 int Emulator::run() {
@@ -192,6 +213,14 @@ void Emulator::letOperatorsLook(TimePoint now) {
 
 void Emulator::noticeCommandsEnd() {
     const std::optional<int> status = command->status();
+    if (status && !result && isStartingOver && !command->isLeftRunning()) {
+        isStartingOver = false;
+        line.clear();
+        display = Display();
+        keypad.switchOn();
+        webFront->beginAnew();
+        return startCommand();
+    }
     if (status && !result) {
         if (journeyOperator)
             throw std::runtime_error("the command ended with " + described(*status) +

@@ -34,6 +34,8 @@ class Emulator {
     int run();
 
   private:
+    void startCommand();
+    void startOver();
     void handleSignal(int number);
     void turn();
     [[nodiscard]] TimePoint nextTurn(TimePoint now) const;
@@ -57,8 +59,11 @@ class Emulator {
     std::unique_ptr<WebFront> webFront;
     std::unique_ptr<Recorder> recorder;
     std::vector<Operator *> operators; // those of the above that exist, until all is over
+    std::vector<std::string> words;    // the command and its arguments
     std::unique_ptr<ChildProcess> command;
+    bool isOutputKept = false; // of the command
     bool isJourney = false;
+    bool isStartingOver = false; // once the command has ended
     TimePoint lastTurn;
     std::optional<int> result; // the exit status, once all is over
     std::string reason;        // for it, as the page tells it

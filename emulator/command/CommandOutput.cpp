@@ -21,7 +21,11 @@ FileDescriptor CommandOutput::open() {
     std::array<int, 2> ends{};
     if (pipe2(ends.data(), O_CLOEXEC) != 0)
         throw std::system_error(errno, std::generic_category(), "cannot open a pipe");
+    arrivals.reset();
     pipe = FileDescriptor(ends[0]);
+    line.clear();
+    lines.clear();
+    timesSeen.clear();
     fcntl(pipe.get(), F_SETFL, O_NONBLOCK);
     arrivals = std::make_unique<Readable>(loop, pipe.get(), [this] { read(); });
     return FileDescriptor(ends[1]);

@@ -18,7 +18,8 @@ class CommandOutput {
   public:
     explicit CommandOutput(Loop &itsLoop) : loop(itsLoop) {}
 
-    /// Opens a pipe and returns the end that the command is to write to.
+    /// Opens a pipe and returns the end that the command is to write to. What an earlier command
+    /// has printed is forgotten.
     FileDescriptor open();
     /// The last lines that came only once.
     [[nodiscard]] std::string lastWords();

@@ -120,6 +120,15 @@ void Line::answer(unsigned char keyCode) {
     lookedAt = now;
 }
 
+void Line::clear() {
+    tcflush(slave.get(), TCIOFLUSH);
+    do {
+        backlog.clear();
+        collect();
+    } while (!backlog.empty());
+    answersRead = answersWritten;
+}
+
 void Line::trace(char direction, TimePoint time, const unsigned char *bytes, std::size_t count) {
     if (!traceFile)
         return;

@@ -48,6 +48,9 @@ class Line {
     /// that does not fit into what the program left unread is lost, as in an overrun.
     void answer(unsigned char keyCode);
 
+    /// Forgets what is on its way in either direction, as when another program takes over.
+    void clear();
+
     /// To be called at the end. Throws std::runtime_error when not all could be written to the
     /// trace.
     void finishTrace();

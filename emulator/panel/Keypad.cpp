@@ -2,6 +2,12 @@
 
 namespace emulator {
 
+void Keypad::switchOn() {
+    release();
+    isWaiting = false;
+    quietRequests = wholePoll;
+}
+
 void Keypad::press(Key key) {
     keyDown = key;
     isTapping = false;

@@ -19,6 +19,8 @@ class Keypad {
     /// `send` is called with the key for each answer.
     explicit Keypad(Send toSend) : send(std::move(toSend)) {}
 
+    /// As when the panel has just been switched on: no key is down, and none has been asked for.
+    void switchOn();
     /// Puts a key down until `release`. A key that was down comes up.
     void press(Key key);
     void release();

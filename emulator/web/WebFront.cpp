@@ -1,6 +1,6 @@
 #include "emulator/web/WebFront.h"
 
-#include "emulator/panel/Font.h"
+#include "emulator/panel/Glass.h"
 #include "emulator/web/WebFiles.h"
 
 #include <algorithm>
@@ -20,6 +20,7 @@ constexpr std::streamoff mostRecorded = 1 << 20; // bytes: many hours of pressin
 constexpr std::string_view pressWord = "press ";
 constexpr std::string_view holdWord = "hold";
 constexpr std::string_view releaseWord = "release";
+constexpr std::string_view startOverWord = "start over";
 // A page says twice a second that its key is held. A connection that has stalled, or a page that
 // hangs, must not keep the key down.
 constexpr std::chrono::milliseconds holdTime{1500};
@@ -34,24 +35,39 @@ std::string withoutOtherBytes(const std::string &bytes) {
     return text;
 }
 
-std::string fontJson() {
+// All that the page needs to know to draw the glass.
+std::string glassJson() {
     json glyphs{{noCharacter, glyph('\0')}};
     for (char c = ' '; isPrintable(c); c++)
         glyphs[std::string(1, c)] = glyph(c);
-    return glyphs.dump();
+    return json{
+        {"glyphs", glyphs},
+        {"glyph", {glyphColumns, glass::glyphRows}},
+        {"pitch", {glass::cellPitch, glass::rowPitch}},
+        {"size", {glass::textWidth + 2 * glass::margin, glass::textHeight + 2 * glass::margin}},
+        {"margin", glass::margin},
+        {"background", glass::background},
+        {"blankDot", glass::blankDot},
+        {"darkDot", glass::darkDot},
+    }
+        .dump();
 }
 
 } // namespace
 
 WebFront::WebFront(Loop &loop, const boost::asio::ip::tcp::endpoint &endpoint,
-                   const Display &itsDisplay, Keypad &itsKeypad, Use itsUse)
-    : display(itsDisplay), keypad(itsKeypad), use(itsUse), finger(itsKeypad), load(Clock::now()),
-      recorder(recording, itsDisplay, itsKeypad), server(loop, endpoint, *this) {}
+                   const Display &itsDisplay, Keypad &itsKeypad, Use itsUse,
+                   std::function<void()> itsStartOver)
+    : display(itsDisplay), keypad(itsKeypad), use(itsUse), startOver(std::move(itsStartOver)),
+      finger(itsKeypad), load(Clock::now()), server(loop, endpoint, *this) {
+    recorder.emplace(recording, display, keypad);
+}
 
 std::optional<int> WebFront::look(TimePoint now) {
-    if (isRecording())
-        recorder.look(now);
-    if (recorder.isBetweenKeys())
+    if (!isFull)
+        recorder->look(now);
+    isFull = recording.tellp() >= mostRecorded;
+    if (recorder->isBetweenKeys())
         recorded = recording.tellp();
     if (now >= holdUntil)
         letGo();
@@ -75,11 +91,19 @@ std::optional<TimePoint> WebFront::wakeAt() const {
     return wake;
 }
 
+void WebFront::beginAnew() {
+    letGo();
+    appliances++;
+    recording.str("");
+    recorded = 0;
+    recorder.emplace(recording, display, keypad);
+}
+
 void WebFront::finish(const std::string &reason) {
     ending = reason;
     finger.lift();
-    if (isRecording())
-        recorder.finish();
+    if (!isFull)
+        recorder->finish();
     server.finish(state());
 }
 
@@ -88,8 +112,8 @@ std::optional<WebService::Resource> WebFront::resource(std::string_view name) co
                                     [&](const WebFile &each) { return each.name == name; });
     if (file != webFiles.end())
         return Resource{file->type, std::string(file->text)};
-    if (name == "font.json")
-        return Resource{"application/json", fontJson()};
+    if (name == "glass.json")
+        return Resource{"application/json", glassJson()};
     if (name == "journey")
         return Resource{"text/plain; charset=utf-8", journey()};
     return std::nullopt;
@@ -103,13 +127,15 @@ std::string WebFront::state() const {
          {withoutOtherBytes(display.visibleRow(0)), withoutOtherBytes(display.visibleRow(1))}},
         {"cursor", cursor ? json{cursor->row, cursor->column} : json()},
         {"down", down ? json(traits(*down).name) : json()},
+        {"presser", presser ? json(*presser) : json()},
         {"counted", traits(keypad.lastAnswer()).name},
         {"polls", keypad.heldPolls()},
         {"bytes", load.recentBytes()},
         {"load", std::lround(load.percent())},
         {"program", programState()},
-        {"watch", use == Use::watch},
+        {"appliance", appliances},
         {"recorded", static_cast<std::streamoff>(recorded)},
+        {"isFull", isFull},
     };
     if (!ending.empty()) {
         state["ending"] = withoutOtherBytes(ending);
@@ -118,11 +144,27 @@ std::string WebFront::state() const {
     return state.dump();
 }
 
-bool WebFront::take(const WebSession &page, std::string_view message) {
-    const TimePoint now = Clock::now();
+std::string WebFront::welcome(const Page &page) const {
+    json state = json::parse(this->state());
+    state["page"] = page.number;
+    const char *watchedBy = page.use == Use::watch ? "address" : "";
+    state["watch"] = use == Use::watch ? "journey" : watchedBy;
+    state["canStartOver"] = startOver && page.use == Use::operate;
+    return state.dump();
+}
+
+bool WebFront::take(const Page &page, std::string_view message) {
+    if (page.use == Use::watch)
+        return false;
+    if (message == startOverWord) {
+        if (startOver && ending.empty())
+            startOver();
+        return startOver != nullptr;
+    }
     if (message == releaseWord || message == holdWord) {
-        if (presser != &page || holdUntil == TimePoint::max())
+        if (presser != page.number || holdUntil == TimePoint::max())
             return true;
+        const TimePoint now = Clock::now();
         holdUntil = message == holdWord ? now + holdTime : TimePoint::max();
         if (message == releaseWord)
             finger.release(now);
@@ -133,27 +175,27 @@ bool WebFront::take(const WebSession &page, std::string_view message) {
     });
     if (key == keys.end())
         return false;
-    if (use == Use::operate && ending.empty()) {
-        finger.press(key->key, now);
-        presser = &page;
-        holdUntil = now + holdTime;
-    }
+    if (use == Use::operate && ending.empty())
+        press(key->key, page);
     return true;
 }
 
-void WebFront::leave(const WebSession &page) {
-    if (presser == &page)
+void WebFront::press(Key key, const Page &page) {
+    const TimePoint now = Clock::now();
+    finger.press(key, now);
+    presser = page.number;
+    holdUntil = now + holdTime;
+}
+
+void WebFront::leave(const Page &page) {
+    if (presser == page.number)
         letGo();
 }
 
 void WebFront::letGo() {
     finger.lift();
-    presser = nullptr;
+    presser.reset();
     holdUntil = TimePoint::max();
-}
-
-bool WebFront::isRecording() {
-    return recording.tellp() < mostRecorded;
 }
 
 std::string WebFront::programState() const {
@@ -164,7 +206,7 @@ std::string WebFront::programState() const {
 }
 
 std::string WebFront::journey() const {
-    return recording.str() + recorder.end();
+    return recording.str() + recorder->end();
 }
 
 } // namespace emulator

@@ -9,6 +9,8 @@
 #include "emulator/web/WebServer.h"
 #include "emulator/web/WebService.h"
 
+#include <functional>
+#include <optional>
 #include <sstream>
 #include <string>
 
@@ -18,9 +20,10 @@ namespace emulator {
 /// and have its one finger: whoever presses a key last has it.
 class WebFront : public Operator, private WebService {
   public:
-    /// Serves the page from now on. Throws std::runtime_error when it cannot.
+    /// Serves the page from now on. Throws std::runtime_error when it cannot. `startOver` is called
+    /// when somebody at a page wants a fresh appliance; it is empty if there can be none.
     WebFront(Loop &loop, const boost::asio::ip::tcp::endpoint &endpoint, const Display &display,
-             Keypad &keypad, Use use);
+             Keypad &keypad, Use use, std::function<void()> startOver);
 
     [[nodiscard]] const WebServer &webServer() const { return server; }
 
@@ -28,6 +31,8 @@ class WebFront : public Operator, private WebService {
     [[nodiscard]] std::optional<TimePoint> wakeAt() const override;
     void carried(unsigned char byte) override { load.carried(byte); }
 
+    /// The panel stands before a fresh appliance from now on, with which the recording begins anew.
+    void beginAnew();
     /// All is over: tells the open pages why, and takes nothing any more.
     void finish(const std::string &reason);
     /// True when all browsers have been told.
@@ -36,23 +41,27 @@ class WebFront : public Operator, private WebService {
   private:
     [[nodiscard]] std::optional<Resource> resource(std::string_view name) const override;
     [[nodiscard]] std::string state() const override;
-    bool take(const WebSession &page, std::string_view message) override;
-    void leave(const WebSession &page) override;
+    [[nodiscard]] std::string welcome(const Page &page) const override;
+    bool take(const Page &page, std::string_view message) override;
+    void leave(const Page &page) override;
 
+    void press(Key key, const Page &page);
     void letGo();
-    [[nodiscard]] bool isRecording();
     [[nodiscard]] std::string programState() const;
     [[nodiscard]] std::string journey() const;
 
     const Display &display;
     Keypad &keypad;
     Use use;
+    std::function<void()> startOver;
     Finger finger;
-    const WebSession *presser = nullptr;    // whose key is down
-    TimePoint holdUntil = TimePoint::max(); // unless that page says that it is still held
+    std::optional<unsigned long> presser;   // the page that has pressed a key last
+    TimePoint holdUntil = TimePoint::max(); // unless that page says that it still holds the key
     LineLoad load;
-    std::ostringstream recording; // of all that has been done since the start
-    Recorder recorder;
+    unsigned appliances = 1;      // so far
+    std::ostringstream recording; // of all that has been done at the present one
+    std::optional<Recorder> recorder;
+    bool isFull = false;         // of as much as may be recorded
     std::streamoff recorded = 0; // bytes of it, before the key that is being counted
     std::string ending;          // why all is over, once it is
     std::string shown;           // the last state

@@ -15,6 +15,16 @@ namespace {
 
 constexpr std::size_t tokenBytes = 16;
 
+std::string newToken() {
+    std::array<unsigned char, tokenBytes> bytes{};
+    if (getrandom(bytes.data(), bytes.size(), 0) != static_cast<ssize_t>(bytes.size()))
+        throw std::runtime_error("the system has no random numbers");
+    std::string token;
+    for (const unsigned char byte : bytes)
+        token += hexadecimal(byte);
+    return token;
+}
+
 // Takes as long for any two texts of this length: how much of a guess is right must not be seen.
 bool isEqual(std::string_view one, std::string_view other) {
     if (one.size() != other.size())
@@ -32,19 +42,15 @@ bool isPort(std::string_view text) {
 
 } // namespace
 
-WebGate::WebGate() {
-    std::array<unsigned char, tokenBytes> bytes{};
-    if (getrandom(bytes.data(), bytes.size(), 0) != static_cast<ssize_t>(bytes.size()))
-        throw std::runtime_error("the system has no random numbers");
-    for (const unsigned char byte : bytes)
-        secret += hexadecimal(byte);
-}
+WebGate::WebGate() : operatorsToken(newToken()), watchersToken(newToken()) {}
 
-std::optional<std::string_view> WebGate::nameBehindToken(std::string_view target) const {
-    const std::string start = "/" + secret + "/";
-    if (!isEqual(target.substr(0, start.size()), start))
-        return std::nullopt;
-    return target.substr(start.size());
+std::optional<WebGate::Entry> WebGate::entry(std::string_view target) const {
+    for (const Use use : {Use::operate, Use::watch}) {
+        const std::string start = "/" + token(use) + "/";
+        if (isEqual(target.substr(0, start.size()), start))
+            return Entry{use, target.substr(start.size())};
+    }
+    return std::nullopt;
 }
 
 bool WebGate::isOwnHost(std::string_view host) {
@@ -61,7 +67,7 @@ bool WebGate::isOwnHost(std::string_view host) {
 }
 
 bool WebGate::isSameOrigin(std::string_view origin, std::string_view host) {
-    return origin == "http://" + std::string(host);
+    return origin == "http://" + std::string(host) || origin == "https://" + std::string(host);
 }
 
 } // namespace emulator

@@ -3,7 +3,10 @@
 #include "emulator/base/plainAddress.h"
 #include "emulator/web/WebSession.h"
 
+#include <boost/asio/ip/udp.hpp>
+
 #include <algorithm>
+#include <fcntl.h>
 #include <sstream>
 #include <stdexcept>
 
@@ -14,17 +17,37 @@ namespace {
 using boost::asio::ip::tcp;
 using boost::system::error_code;
 
-constexpr std::size_t mostSessions = 32;
+constexpr std::size_t mostPages = 64;
+constexpr std::size_t mostRequests = 64; // connections that are no pages
+constexpr std::size_t mostRefused = 16;  // connections beyond that, which are only told so
 constexpr std::chrono::milliseconds restTime{100};
+
+// What the command starts must not hold a browser's connection.
+template <typename Socket> void closeInCommand(Socket &socket) {
+    fcntl(socket.native_handle(), F_SETFD, FD_CLOEXEC);
+}
 
 tcp::acceptor listening(Loop &loop, const tcp::endpoint &endpoint) {
     try {
-        return {loop.asio(), endpoint};
+        tcp::acceptor acceptor(loop.asio(), endpoint);
+        closeInCommand(acceptor);
+        return acceptor;
     } catch (const boost::system::system_error &error) {
         std::ostringstream where;
         where << endpoint;
         throw std::runtime_error("cannot listen on " + where.str() + ": " + error.code().message());
     }
+}
+
+// The address of this machine from which it would send to far ones. Nothing is sent.
+boost::asio::ip::address ownAddress(Loop &loop) {
+    using boost::asio::ip::udp;
+    constexpr const char *anyFarAddress = "192.0.2.1";
+    udp::socket socket(loop.asio());
+    error_code error;
+    socket.connect({boost::asio::ip::make_address(anyFarAddress), 9}, error);
+    const auto own = socket.local_endpoint(error);
+    return error ? boost::asio::ip::address() : own.address();
 }
 
 } // namespace
@@ -40,22 +63,48 @@ WebServer::~WebServer() {
         session->close();
 }
 
-std::string WebServer::address() const {
+std::string WebServer::address(Use use) const {
     tcp::endpoint endpoint = acceptor.local_endpoint();
     if (endpoint.address().is_unspecified())
         endpoint.address(boost::asio::ip::address_v4::loopback());
+    return addressAt(endpoint, use);
+}
+
+std::optional<std::string> WebServer::addressForOthers(Use use) const {
+    tcp::endpoint endpoint = acceptor.local_endpoint();
+    if (plainAddress(endpoint.address()).is_loopback())
+        return std::nullopt;
+    if (endpoint.address().is_unspecified())
+        endpoint.address(ownAddress(loop));
+    if (endpoint.address().is_unspecified())
+        return "";
+    return addressAt(endpoint, use);
+}
+
+std::string WebServer::addressAt(tcp::endpoint endpoint, Use use) const {
     std::ostringstream address;
-    address << "http://" << endpoint << "/" << gate.token() << "/";
+    address << "http://" << endpoint << "/" << gate.token(use) << "/";
     return address.str();
 }
 
-bool WebServer::isOpenToOthers() const {
-    return !plainAddress(acceptor.local_endpoint().address()).is_loopback();
+bool WebServer::hasRoom() const {
+    return pages() < mostPages;
 }
 
-bool WebServer::hasPages() const {
-    return std::any_of(sessions.begin(), sessions.end(),
-                       [](const auto &session) { return session->isPage(); });
+std::string WebServer::tooManyPages() {
+    return std::to_string(mostPages) +
+           " browsers have the panel open, which is the most there can be. Close one of them, and "
+           "reload this page.";
+}
+
+std::string WebServer::tooManyRequests() {
+    return "More than " + std::to_string(mostRequests) +
+           " requests are being answered. Reload this page in a few seconds.";
+}
+
+std::size_t WebServer::pages() const {
+    return static_cast<std::size_t>(std::count_if(
+        sessions.begin(), sessions.end(), [](const auto &session) { return session->isPage(); }));
 }
 
 void WebServer::show(std::string state) {
@@ -92,18 +141,21 @@ void WebServer::accept() {
     }));
 }
 
-// Those who have not shown the token must not keep others out.
+// Those who have no token must not keep others out, and neither must a connection that is only kept
+// for a request to come.
 void WebServer::admit(tcp::socket socket) {
-    if (sessions.size() >= mostSessions) {
+    closeInCommand(socket);
+    if (sessions.size() - pages() >= mostRequests) {
         const auto oldest = std::find_if(sessions.begin(), sessions.end(),
-                                         [](const auto &session) { return !session->isPage(); });
-        if (oldest == sessions.end())
-            return;
-        std::shared_ptr<WebSession>(*oldest)->close();
+                                         [](const auto &session) { return session->isWaiting(); });
+        if (oldest != sessions.end())
+            std::shared_ptr<WebSession>(*oldest)->close();
     }
-    sessions.push_back(
-        std::make_shared<WebSession>(loop, gate, service, std::move(socket),
-                                     [this](const WebSession &session) { forget(session); }));
+    const std::size_t requests = sessions.size() - pages();
+    if (requests >= mostRequests + mostRefused)
+        return;
+    sessions.push_back(std::make_shared<WebSession>(loop, *this, service, std::move(socket),
+                                                    ++admitted, requests >= mostRequests));
     sessions.back()->start();
 }
 

@@ -1,5 +1,7 @@
 #include "emulator/web/WebSession.h"
 
+#include "emulator/web/WebServer.h"
+
 #include <utility>
 
 namespace emulator {
@@ -12,7 +14,7 @@ namespace http = beast::http;
 namespace websocket = beast::websocket;
 using boost::system::error_code;
 
-constexpr std::chrono::seconds requestTime{5}; // for a request to be there as a whole
+constexpr std::chrono::seconds requestTime{5}; // for the next request to be there as a whole
 constexpr std::chrono::seconds answerTime{30}; // for its answer to be taken
 constexpr std::chrono::seconds writeTime{5};   // for a state to be taken
 constexpr std::chrono::seconds silence{6};     // of a browser that does not even answer a ping
@@ -32,17 +34,15 @@ std::string_view view(beast::string_view text) {
 
 } // namespace
 
-WebSession::WebSession(Loop &itsLoop, const WebGate &itsGate, WebService &itsService,
-                       asio::ip::tcp::socket itsSocket,
-                       std::function<void(const WebSession &)> itsOnClosed)
-    : loop(itsLoop), gate(itsGate), service(itsService), onClosed(std::move(itsOnClosed)),
-      socket(std::move(itsSocket)), writeLimit(loop.asio()) {
+WebSession::WebSession(Loop &itsLoop, WebServer &itsServer, WebService &itsService,
+                       asio::ip::tcp::socket itsSocket, unsigned long number, bool itIsTooMany)
+    : loop(itsLoop), server(itsServer), service(itsService), page{number, Use::watch},
+      isTooMany(itIsTooMany), socket(std::move(itsSocket)), writeLimit(loop.asio()) {
     error_code ignored;
     Stream &stream = socket.next_layer();
     stream.socket().set_option(asio::ip::tcp::no_delay(true), ignored);
     stream.socket().set_option(asio::socket_base::send_buffer_size(sendBufferBytes), ignored);
     stream.rate_policy().read_limit(mostBytesPerSecond);
-    parser.header_limit(mostHeaderBytes);
 }
 
 // What comes after an operation: the session ends if it failed.
@@ -56,12 +56,19 @@ template <typename Step> auto WebSession::then(Step step) {
 }
 
 void WebSession::start() {
+    isAnswering = received.size() > 0; // what came with the last request
+    parser.emplace();
+    parser->header_limit(mostHeaderBytes);
     socket.next_layer().expires_after(requestTime);
     http::async_read(
-        socket.next_layer(), received, parser,
+        socket.next_layer(), received, *parser,
         loop.turnAfter([self = shared_from_this()](const error_code &error, std::size_t) {
             if (error == http::error::header_limit)
-                self->refuseHeader();
+                self->refuse(http::status::request_header_fields_too_large,
+                             "The browser has sent a header of more than " +
+                                 std::to_string(mostHeaderBytes) +
+                                 " bytes. Cookies of other servers at this address may be the "
+                                 "cause: delete them, or open the page in a private window.");
             else if (error)
                 self->close();
             else if (!self->isClosed)
@@ -69,12 +76,8 @@ void WebSession::start() {
         }));
 }
 
-void WebSession::refuseHeader() {
-    respond(http::status::request_header_fields_too_large,
-            {"text/plain; charset=utf-8",
-             "The browser has sent a header of more than " + std::to_string(mostHeaderBytes) +
-                 " bytes. Cookies of other servers at this address may be the cause: delete them, "
-                 "or open the page in a private window.\n"});
+void WebSession::refuse(http::status status, const std::string &sentence) {
+    respond(status, {"text/plain; charset=utf-8", sentence + "\n"});
 }
 
 // Closed at once, the connection would be reset, and the answer lost with what has not been read.
@@ -87,7 +90,8 @@ void WebSession::passOverRest() {
 }
 
 void WebSession::answerRequest() {
-    const auto &request = parser.get();
+    isAnswering = true;
+    const auto &request = parser->get();
     const std::string_view host = view(request[http::field::host]);
     const auto origin = request.find(http::field::origin);
     const bool isUpgrade = websocket::is_upgrade(request);
@@ -95,24 +99,37 @@ void WebSession::answerRequest() {
         origin == request.end() ? !isUpgrade : WebGate::isSameOrigin(view(origin->value()), host);
     if (!WebGate::isOwnHost(host) || !isFromHere)
         return respond(http::status::forbidden);
-    const auto name = gate.nameBehindToken(view(request.target()));
-    if (!name)
+    const auto entry = server.webGate().entry(view(request.target()));
+    if (!entry)
         return respond(http::status::not_found);
+    page.use = entry->use;
     if (request.method() != http::verb::get)
         return respond(http::status::method_not_allowed);
-    if (isUpgrade && *name == "panel") {
+    if (isTooMany)
+        return refuse(http::status::service_unavailable, WebServer::tooManyRequests());
+    answerFor(entry->name, isUpgrade);
+}
+
+void WebSession::answerFor(std::string_view name, bool isUpgrade) {
+    // A WebSocket does not tell a page why it was refused, but what the page asks for before does.
+    const bool isForPage = name.empty() || name == "glass.json" || name == "panel";
+    if (isForPage && !server.hasRoom())
+        return refuse(http::status::service_unavailable, WebServer::tooManyPages());
+    if (isUpgrade && name == "panel") {
+        isOpening = true;
         socket.next_layer().expires_never(); // the WebSocket keeps its own time
         socket.set_option(websocket::stream_base::timeout{requestTime, silence, true});
         socket.read_message_max(mostMessageBytes);
-        return socket.async_accept(request, then(&WebSession::openPage));
+        return socket.async_accept(parser->get(), then(&WebSession::openPage));
     }
-    auto resource = service.resource(*name);
+    auto resource = service.resource(name);
     resource ? respond(http::status::ok, std::move(*resource)) : respond(http::status::not_found);
 }
 
 void WebSession::respond(http::status status, WebService::Resource resource) {
+    response = {};
     response.result(status);
-    response.keep_alive(false);
+    response.keep_alive(status == http::status::ok && parser->keep_alive());
     response.set("Content-Security-Policy", contentPolicy);
     response.set(http::field::cache_control, "no-store");
     response.set("X-Content-Type-Options", "nosniff");
@@ -124,15 +141,19 @@ void WebSession::respond(http::status status, WebService::Resource resource) {
     response.body() = std::move(resource.body);
     response.prepare_payload();
     socket.next_layer().expires_after(answerTime);
-    const bool isRead = status != http::status::request_header_fields_too_large;
-    http::async_write(socket.next_layer(), response,
-                      then(isRead ? &WebSession::close : &WebSession::passOverRest));
+    http::async_write(socket.next_layer(), response, then(&WebSession::endResponse));
+}
+
+void WebSession::endResponse() {
+    if (response.keep_alive())
+        return start();
+    parser->is_done() ? close() : passOverRest();
 }
 
 void WebSession::openPage() {
     hasOpened = true;
     socket.text(true);
-    show(std::make_shared<const std::string>(service.state()));
+    show(std::make_shared<const std::string>(service.welcome(page)));
     awaitMessage();
 }
 
@@ -144,7 +165,7 @@ void WebSession::awaitMessage() {
 void WebSession::takeMessage() {
     const auto bytes = received.cdata();
     const std::string_view message(static_cast<const char *>(bytes.data()), bytes.size());
-    if (!isLeaving && (isTooFast() || !service.take(*this, message)))
+    if (!isLeaving && (isTooFast() || !service.take(page, message)))
         return close();
     awaitMessage();
 }
@@ -159,7 +180,7 @@ bool WebSession::isTooFast() {
 }
 
 void WebSession::show(Text state) {
-    if (isLeaving || isClosed)
+    if (!hasOpened || isLeaving || isClosed)
         return;
     next = std::move(state);
     if (!current)
@@ -200,8 +221,8 @@ void WebSession::close() {
     writeLimit.cancel();
     socket.next_layer().close();
     if (hasOpened)
-        service.leave(*this);
-    onClosed(*this);
+        service.leave(page);
+    server.forget(*this);
 }
 
 } // namespace emulator

@@ -1,7 +1,6 @@
 #pragma once
 
 #include "emulator/base/Loop.h"
-#include "emulator/web/WebGate.h"
 #include "emulator/web/WebService.h"
 
 #include <boost/asio/ip/tcp.hpp>
@@ -11,31 +10,37 @@
 #include <boost/beast/http.hpp>
 #include <boost/beast/websocket.hpp>
 
-#include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 
 namespace emulator {
 
-/// A connection from a browser: one request and its answer, or, when that asks for a WebSocket, an
-/// open page, which is shown states and sends messages until one of the two ends it.
+class WebServer;
+
+/// A connection from a browser: requests and their answers, until one of them asks for a WebSocket.
+/// From then on it is an open page, which is shown states and sends messages until one of the two
+/// ends it.
 ///
 /// Of the states a page gets the newest whenever it has taken the one before; what comes meanwhile
 /// is left out. Whatever breaks the rules, or takes too long, is closed without a word, but for a
-/// header that is too long, which may be no fault of the operator's.
+/// header that is too long, or a browser too many, which may be no fault of the operator's.
 class WebSession : public std::enable_shared_from_this<WebSession> {
   public:
     using Text = std::shared_ptr<const std::string>;
 
-    /// All three have to be there until this is closed; `onClosed` is called once then.
-    WebSession(Loop &loop, const WebGate &gate, WebService &service,
-               boost::asio::ip::tcp::socket socket,
-               std::function<void(const WebSession &)> onClosed);
+    /// The server, which is told when this is closed, and the service have to be there until then.
+    /// One that is too many is only told so.
+    WebSession(Loop &loop, WebServer &server, WebService &service,
+               boost::asio::ip::tcp::socket socket, unsigned long number, bool isTooMany);
 
-    /// Waits for the request.
+    /// Waits for a request.
     void start();
-    /// True from the WebSocket's handshake on.
-    [[nodiscard]] bool isPage() const { return hasOpened; }
+    /// True once it has begun to open a page.
+    [[nodiscard]] bool isPage() const { return isOpening; }
+    /// True while it has nothing to answer.
+    [[nodiscard]] bool isWaiting() const { return !isOpening && !isAnswering; }
+    /// Shows this once the page is open.
     void show(Text state);
     /// Shows this as the last, takes nothing any more, and ends the connection.
     void finish(Text state);
@@ -48,10 +53,12 @@ class WebSession : public std::enable_shared_from_this<WebSession> {
     using Response = boost::beast::http::response<boost::beast::http::string_body>;
 
     template <typename Step> auto then(Step step);
-    void refuseHeader();
+    void refuse(boost::beast::http::status status, const std::string &sentence);
     void passOverRest();
     void answerRequest();
+    void answerFor(std::string_view name, bool isUpgrade);
     void respond(boost::beast::http::status status, WebService::Resource resource = {});
+    void endResponse();
     void openPage();
     void awaitMessage();
     void takeMessage();
@@ -60,18 +67,21 @@ class WebSession : public std::enable_shared_from_this<WebSession> {
     void endWriting();
 
     Loop &loop;
-    const WebGate &gate;
+    WebServer &server;
     WebService &service;
-    std::function<void(const WebSession &)> onClosed;
+    WebService::Page page;
+    bool isTooMany;
     boost::beast::websocket::stream<Stream, false> socket; // states are not compressed
     boost::asio::steady_timer writeLimit;
     boost::beast::flat_buffer received;
-    boost::beast::http::request_parser<boost::beast::http::empty_body> parser;
+    std::optional<boost::beast::http::request_parser<boost::beast::http::empty_body>> parser;
     Response response;
     Text next;    // to be written
     Text current; // being written
     TimePoint countedSince;
     int messages = 0; // since then
+    bool isAnswering = false;
+    bool isOpening = false;
     bool hasOpened = false;
     bool isLeaving = false;
     bool isClosed = false;

@@ -4,6 +4,7 @@
 Its memory may grow by as many KiB as the second argument says."""
 
 import contextlib
+import http.client
 import json
 import os
 import random
@@ -43,14 +44,15 @@ class Limits(unittest.TestCase):
         self.assertEqual((status, body[:15]), (200, b"<!DOCTYPE html>"))
         for line in ("default-src 'none'", "no-store", "nosniff", "no-referrer", "DENY"):
             self.assertIn(line, str(headers))
-        self.assertEqual(self.panel.ask(path, Host="localhost:1")[0], 200)
+        for host_or_origin in ({"Host": "localhost:1"}, {"Origin": f"https://{host}"}):
+            self.assertEqual(self.panel.ask(path, **host_or_origin)[0], 200)
         almost = path[:-2] + ("0" if path[-2] != "0" else "1") + "/"
         for status, refused in (
                 (404, [{"path": wrong} for wrong in ("/", almost, path[:-1], "/" + path, path + "x")]),
                 (403, [{"Host": wrong} for wrong in ("", "panel.example", "127.0.0.1.example",
                                                      "localhost:x", "[127.0.0.1]", "[::1")]),
                 (403, [{"Origin": wrong} for wrong in ("null", "http://panel.example",
-                                                       f"https://{host}", f"http://{host}0")]),
+                                                       f"ws://{host}", f"http://{host}0")]),
                 (405, [{"method": "POST"}]),
                 (403, [{"path": path + "panel", **UPGRADE}]),
                 (404, [{"path": almost + "panel", **UPGRADE, "Origin": f"http://{host}"}])):
@@ -68,7 +70,7 @@ class Limits(unittest.TestCase):
         idle = [self.panel.connect() for _ in range(100)]
         idle[-1].sendall(begin + b"x" * 20_000)
         self.assert_well()  # so all of them have been accepted
-        self.assertLess(len(os.listdir(f"/proc/{self.panel.process.pid}/fd")), 64)
+        self.assertLess(len(os.listdir(f"/proc/{self.panel.process.pid}/fd")), 100)
         words = ("press", "press north", "release now", "", "press up" + " " * 2**20)
         status, _, body = self.panel.ask(self.panel.path, Cookie="x" * 30_000)
         self.assertEqual((status, b"Cookies" in body), (431, True))
@@ -80,6 +82,40 @@ class Limits(unittest.TestCase):
             self.assert_closed(page)
         self.assert_well()
         self.assertLess(self.panel.memory(), self.memory + MOST_GROWTH)
+
+    def test_one_page_or_request_too_many_is_told_so_until_another_has_ended(self):
+        load = http.client.HTTPConnection(self.panel.host, timeout=10)
+        for name in ("", "page.css", "page.js", "glass.json"):  # one connection is enough
+            load.request("GET", self.panel.path + name)
+            self.assertEqual(load.getresponse().read()[:1] != b"", load.sock is not None)
+        pages = [self.panel.open() for _ in range(64)]
+        for name in ("", "glass.json", "panel"):
+            status, _, body = self.panel.ask(self.panel.path + name)
+            self.assertEqual((status, b"64 browsers" in body), (503, True))
+        with self.assertRaises(websocket.WebSocketBadStatusException):
+            self.panel.open()
+        self.assertEqual(self.panel.ask(self.panel.path + "journey")[0], 200)
+        pages.pop().close()
+        self.assert_well()
+        # Those that only wait for their next request make room, and those that read no answer do not.
+        request = f"GET {self.panel.path}page.js HTTP/1.1\r\nHost: {self.panel.host}\r\n\r\n".encode()
+        quick = [self.panel.connect() for _ in range(64)]
+        for connection in quick:
+            connection.sendall(request.replace(b"page.js", b"none"))
+        self.assertEqual(self.panel.ask(self.panel.path + "journey")[0], 200)
+        greedy = [self.panel.connect() for _ in range(64)]
+        for connection in greedy:
+            connection.sendall(request * 9)
+            self.assertEqual(connection.recv(1), b"H")
+        answer = self.panel.ask(self.panel.path + "journey")
+        self.assertEqual((answer[0], b"64 requests" in answer[2]), (503, True))
+
+    def test_an_address_to_watch_shows_and_presses_nothing(self):
+        page = self.panel.open(self.panel.watch_address)
+        self.assertEqual(json.loads(page.recv())["watch"], "address")
+        page.send("press up")
+        self.assert_closed(page)
+        self.assert_well()
 
     def test_a_flood_ends_its_page_and_lets_its_key_come_up(self):
         page = self.panel.open()

@@ -7,74 +7,95 @@ const panelKeys = { ArrowUp: "up", ArrowDown: "down", Enter: "enter", Escape: "e
 
 let socket = null;
 let state = null;     // the last that came
-let opened = null;    // how much had been recorded when the page was opened
-let font = null;
+let own = {};         // what holds for this page alone, as the first state has said it
+let opened = 0;       // how much had been recorded when the page was opened
+let glass = null;     // the display's measures and colours, and its characters' dots
 
-// The display. All measures are in dots; a dot is a square with a thin gap behind it.
+// The display. A dot is a square with a thin gap behind it, and as many whole pixels of the screen as
+// fit: pixels that are stretched would make dots uneven.
 
-const columns = 16, rows = 2, margin = 4;
-const cellWidth = 6, cellHeight = 10, glyphWidth = 5, glyphHeight = 8;
-const glassWidth = columns * cellWidth - 1 + 2 * margin;
-const glassHeight = rows * cellHeight - 2 + 2 * margin;
-const blank = "#a0b83a", dark = "#1d2a10", blinkTime = 400;
+const blinkTime = 400;
 const stillness = matchMedia("(prefers-reduced-motion: reduce)");
+let dot = 0, blinkTimer = 0;
 
-function drawGlass() {
-  const canvas = element("glass");
-  const dot = Math.max(2, Math.round(canvas.clientWidth * devicePixelRatio / glassWidth));
-  if (canvas.width !== glassWidth * dot) {
-    canvas.width = glassWidth * dot;
-    canvas.height = glassHeight * dot;
-  }
-  const pen = canvas.getContext("2d");
-  pen.clearRect(0, 0, canvas.width, canvas.height);
-  if (!state || !font)
+function fitGlass() {
+  if (!glass)
     return;
-  const gap = dot >= 4 ? Math.round(dot / 8) || 1 : 0;
-  const isOn = stillness.matches || Math.floor(performance.now() / blinkTime) % 2 === 0;
-  state.rows.forEach((text, row) => [...text].forEach((character, column) => {
-    const hasCursor = isOn && state.cursor && state.cursor[0] === row && state.cursor[1] === column;
-    const glyph = font[character];
-    for (let y = 0; y < glyphHeight; y++)
-      for (let x = 0; x < glyphWidth; x++) {
-        const isSet = glyph[y] >> (glyphWidth - 1 - x) & 1;
-        pen.fillStyle = isSet !== Number(hasCursor) ? dark : blank;
-        pen.fillRect((margin + column * cellWidth + x) * dot,
-                     (margin + row * cellHeight + y) * dot, dot - gap, dot - gap);
-      }
-  }));
+  const canvas = element("dots"), ratio = devicePixelRatio;
+  dot = Math.max(1, Math.floor(element("glass").clientWidth * ratio / glass.size[0]));
+  [canvas.width, canvas.height] = glass.size.map(dots => dots * dot);
+  canvas.style.width = `${canvas.width / ratio}px`;
+  canvas.style.translate = "0";
+  const { left, top } = canvas.getBoundingClientRect();
+  canvas.style.translate = [left, top].map(side => `${Math.round(side * ratio) / ratio - side}px`).join(" ");
+  drawGlass();
 }
 
-// The texts beside the display.
+function drawGlass() {
+  clearTimeout(blinkTimer);
+  if (!state || !dot)
+    return;
+  const { size, margin, pitch, glyph, glyphs, background, blankDot, darkDot } = glass;
+  const pen = element("dots").getContext("2d");
+  const gap = dot >= 4 ? Math.round(dot / 8) || 1 : 0;
+  const isOn = stillness.matches || Math.floor(performance.now() / blinkTime) % 2 === 0;
+  pen.fillStyle = background;
+  pen.fillRect(0, 0, size[0] * dot, size[1] * dot);
+  state.rows.forEach((text, row) => [...text].forEach((character, column) => {
+    const hasCursor = isOn && state.cursor?.[0] === row && state.cursor[1] === column;
+    for (let y = 0; y < glyph[1]; y++)
+      for (let x = 0; x < glyph[0]; x++) {
+        const isSet = glyphs[character][y] >> (glyph[0] - 1 - x) & 1;
+        pen.fillStyle = isSet !== Number(hasCursor) ? darkDot : blankDot;
+        pen.fillRect((margin + column * pitch[0] + x) * dot, (margin + row * pitch[1] + y) * dot,
+                     dot - gap, dot - gap);
+      }
+  }));
+  if (state.cursor && !stillness.matches)
+    blinkTimer = setTimeout(drawGlass, blinkTime - performance.now() % blinkTime);
+}
 
 // The program counts the polls of a held key: the first one acts, the next four rest, and from then on
 // the key repeats or is long.
 function meaning(key, polls) {
-  if (polls === 0) return "not asked for yet";
-  if (polls === 1) return "press";
+  if (polls <= 1) return polls ? "press" : "not asked for yet";
   if (polls <= 5) return "rest";
   return key === "up" || key === "down" ? "repeat" : "long";
 }
 
-function describeKey({ down, counted, polls }) {
-  const key = down ?? (polls ? counted : null);
+const isOthers = ({ down, presser }) => Boolean(down) && presser !== null && presser !== own.page;
+
+function describeKey(state) {
+  const key = state.down ?? (state.polls ? state.counted : null);
   if (!key)
-    return "none is down";
-  const own = key === counted ? polls : 0;
-  const count = own === 1 ? "1 poll" : `${own} polls`;
-  return `${keyNames[key]}${down ? " held" : ""}, ${count}: ${meaning(key, own)}`;
+    return "No key is down";
+  const polls = key === state.counted ? state.polls : 0;
+  const held = state.down ? ` held${isOthers(state) ? " in another browser" : ""}` : "";
+  return `${keyNames[key]}${held}, ${polls} poll${polls === 1 ? "" : "s"}: ${meaning(key, polls)}`;
+}
+
+// An address has its octets in four columns each; elsewhere, a character is what the cursor stands on.
+function describeCursor({ rows, cursor }) {
+  if (!cursor)
+    return "";
+  const [row, column] = cursor, octet = Math.floor(column / 4);
+  if (/^[ \d]{3}(\.[ \d]{3}){3} $/.test(rows[row]))
+    return `Cursor on octet ${octet + 1}: ${rows[row].slice(4 * octet, 4 * octet + 3).trim()}`;
+  return `Cursor on position ${column + 1}: ${rows[row][column].trim() || "blank"}`;
 }
 
 let sayTimer = 0, changedSince = null;
 
 // Drawing a screen takes a fifth of a second, and a screen that is half drawn should not be read out.
-// A key that repeats changes the display all the time, so the rows are then read out once a second.
+// While a key is down it may change all the time, so it is read when the key has come up.
 function sayRows() {
-  changedSince ??= performance.now();
   clearTimeout(sayTimer);
+  if (state.down)
+    return;
+  changedSince ??= performance.now();
   sayTimer = setTimeout(() => {
     changedSince = null;
-    state.rows.forEach((text, row) => {
+    [...state.rows, describeCursor(state)].forEach((text, row) => {
       const line = element("text").children[row];
       if (line.textContent !== text)
         line.textContent = text;
@@ -82,44 +103,53 @@ function sayRows() {
   }, Math.min(250, Math.max(0, changedSince + 1000 - performance.now())));
 }
 
-function notice(text, isAlarm) {
-  if (element("notice").textContent !== text)
-    element("notice").textContent = text;
-  element("notice").classList.toggle("alarm", isAlarm);
-  document.body.classList.toggle("lost", isAlarm);
+function tell(notice, trouble = "") {
+  for (const [id, text] of [["notice", notice], ["trouble", trouble]])
+    if (element(id).textContent !== text)
+      element(id).textContent = text;
+  document.body.classList.toggle("lost", trouble !== "");
 }
 
+const watching = { journey: "A journey is being played: you can watch.",
+                   address: "You can watch: this address presses no keys." };
+
 function show(newest) {
-  const haveRowsChanged = String(state?.rows) !== String(newest.rows);
+  const before = state;
   state = newest;
-  opened ??= state.recorded;
-  drawGlass();
-  if (haveRowsChanged)
+  if ("page" in newest)
+    own = newest;
+  if (before?.appliance !== state.appliance)
+    opened = before ? 0 : state.recorded;
+  const sight = ({ rows, cursor }) => [...rows, cursor?.[0], cursor?.[1]];
+  const hasChanged = !before || sight(state).some((part, k) => part !== sight(before)[k]);
+  if (hasChanged)
+    drawGlass();
+  if (hasChanged || before.down !== state.down)
     sayRows();
   for (const button of keyButtons) {
     button.classList.toggle("down", button.dataset.key === state.down);
-    button.disabled = state.watch || Boolean(state.ending);
+    button.classList.toggle("others", isOthers(state));
+    button.disabled = Boolean(own.watch || state.ending);
   }
   element("held").textContent = describeKey(state);
-  element("load").value = state.load;
-  element("percent").textContent = `${state.load} %`;
+  element("load").textContent = `${state.load} %`;
   element("bytes").textContent = state.bytes;
   element("program").textContent = state.ending ?? state.program;
   element("save").disabled = false;
+  element("anew").disabled = !own.canStartOver || Boolean(state.ending);
+  if (state.isFull)
+    element("saved").textContent = "The recording is full: nothing more is added to it.";
   if (state.ending)
-    notice(`The emulator has ended: ${state.ending}.`, true);
+    tell("", `The emulator has ended: ${state.ending}.`);
   else
-    notice(state.watch ? "A journey is being played: you can watch." : "Connected.", false);
+    tell(watching[own.watch] ?? "Connected.");
 }
 
 // The keys: one is down at a time, by the keyboard key or the pointer that pressed it last.
 
 let presser = null;
 
-function send(text) {
-  if (socket?.readyState === WebSocket.OPEN)
-    socket.send(text);
-}
+const send = text => socket?.readyState === WebSocket.OPEN && socket.send(text);
 
 function press(key, by) {
   presser = by;
@@ -127,26 +157,22 @@ function press(key, by) {
 }
 
 function release(by) {
-  if (presser !== by)
+  if (presser === null || presser !== by)
     return;
   presser = null;
   send("release");
 }
 
-function letGo() {
-  release(presser);
-}
-
 // The emulator lets a key go of which it hears nothing for a second and a half.
 setInterval(() => presser !== null && send("hold"), 500);
 
-// A drawn key that has the keyboard's focus is pressed by Enter and the space bar, as any button.
+// A button that has the keyboard's focus is pressed by Enter and the space bar, as anywhere.
 function keyOf(event) {
   if (event.ctrlKey || event.altKey || event.metaKey)
     return null;
   const isActivation = event.key === "Enter" || event.key === " ";
-  const button = event.target.closest?.("button");
-  return button && isActivation ? button.dataset.key : panelKeys[event.key];
+  const button = isActivation && event.target.closest?.("button, summary");
+  return button ? button.dataset.key : panelKeys[event.key];
 }
 
 addEventListener("keydown", event => {
@@ -154,7 +180,7 @@ addEventListener("keydown", event => {
   if (!key)
     return;
   event.preventDefault();
-  if (!event.repeat)
+  if (!event.repeat && !own.watch)
     press(key, event.code);
 });
 addEventListener("keyup", event => {
@@ -162,20 +188,15 @@ addEventListener("keyup", event => {
     event.preventDefault();
   release(event.code);
 });
-addEventListener("blur", letGo);
-addEventListener("pagehide", letGo);
-document.addEventListener("visibilitychange", () => document.hidden && letGo());
+for (const away of ["blur", "pagehide"])
+  addEventListener(away, () => release(presser));
+document.addEventListener("visibilitychange", () => document.hidden && release(presser));
 
+for (const end of ["pointerup", "pointercancel"])
+  addEventListener(end, event => release(event.pointerId));
 for (const button of keyButtons) {
   const key = button.dataset.key;
-  button.addEventListener("pointerdown", event => {
-    if (event.button !== 0)
-      return;
-    button.setPointerCapture(event.pointerId);
-    press(key, event.pointerId);
-  });
-  for (const end of ["pointerup", "pointercancel", "lostpointercapture"])
-    button.addEventListener(end, event => release(event.pointerId));
+  button.addEventListener("pointerdown", event => event.button === 0 && press(key, event.pointerId));
   // The focus stays away, so that Enter and the space bar keep their meaning.
   button.addEventListener("mousedown", event => event.preventDefault());
   button.addEventListener("contextmenu", event => event.preventDefault());
@@ -192,29 +213,49 @@ for (const button of keyButtons) {
 // opened, behind the two lines with which every journey begins.
 element("save").addEventListener("click", async () => {
   try {
-    const text = state.journey ?? await fetched("journey", "text");
+    const text = state.journey ?? await (await fetched("journey")).text();
     const head = text.split("\n", 2).join("\n") + "\n";
-    const added = new TextEncoder().encode(text).slice(opened);  // which counts bytes
+    const bytes = new TextEncoder().encode(text);  // of which `opened` is a number
     const link = document.createElement("a");
-    link.href = URL.createObjectURL(new Blob([head, added], { type: "text/plain" }));
+    link.href = URL.createObjectURL(new Blob([head, bytes.slice(opened)], { type: "text/plain" }));
     link.download = "panel.journey";
     link.click();
     setTimeout(() => URL.revokeObjectURL(link.href), 1000);
+    const mayBeginInMenu = /^(tap|hold) enter/m.test(new TextDecoder().decode(bytes.slice(0, opened)));
+    element("saved").textContent = !mayBeginInMenu ? "Saved." :
+      "Saved. Enter was pressed before this page was opened: if it was opened in a menu, the journey " +
+      "cannot be played. Reload the page while a status page is shown, and do it once more.";
   } catch {
-    notice("The journey could not be fetched.", true);
+    element("saved").textContent = "The journey could not be fetched: nothing has been saved.";
   }
 });
 
-async function fetched(name, kind) {
-  const answer = await fetch(name, { signal: AbortSignal.timeout(patience) });
-  if (!answer.ok)
-    throw new Error(answer.status);
-  return answer[kind]();
-}
+element("anew").addEventListener("click", () => {
+  if (confirm("Start over with a fresh appliance? All that was set and recorded is lost."))
+    send("start over");
+});
+
+element("full").hidden = !document.fullscreenEnabled;
+element("full").addEventListener("click", async () => {
+  if (document.fullscreenElement)
+    return document.exitFullscreen();
+  await document.documentElement.requestFullscreen();
+  // Otherwise Escape would only end the full screen.
+  navigator.keyboard?.lock?.(["Escape"]);
+});
+
+// The connection.
 
 const retryTime = 1000;
 const patience = 4000;  // the emulator sends a state every second, even if nothing has changed
 let silenceTimer = 0;
+
+async function fetched(name) {
+  const answer = await fetch(name, { signal: AbortSignal.timeout(patience) });
+  if (!answer.ok)
+    throw new Error("refused", { cause: answer.status === 503 ? await answer.text() : "" });
+  return answer;
+}
 
 function awaitState() {
   clearTimeout(silenceTimer);
@@ -225,40 +266,46 @@ function awaitState() {
   }, patience);
 }
 
-function connectAgain() {
+function connectAgain({ cause } = {}) {
   clearTimeout(silenceTimer);
   presser = null;
   if (state?.ending)
     return;
-  for (const button of keyButtons) {
+  for (const button of [...keyButtons, element("anew")]) {
     button.classList.remove("down");
     button.disabled = true;
   }
-  for (const field of ["held", "percent", "bytes", "program"])
+  for (const field of ["held", "load", "bytes", "program"])
     element(field).textContent = "";
-  element("load").value = 0;
-  notice("The connection is lost. Trying again … If the emulator was ended, start it anew and " +
-         "open the address that it prints.", true);
+  tell("", cause || "The connection is lost. Trying again … If the emulator was ended, start it anew and " +
+       "open the address that it prints.");
   setTimeout(connect, retryTime);
 }
 
 async function connect() {
   try {
-    font ??= await fetched("font.json", "json");
-  } catch {
-    return connectAgain();
+    glass = await (await fetched("glass.json")).json();
+  } catch (error) {
+    return connectAgain(error);
   }
-  const address = new URL("panel", location.href);
-  address.protocol = "ws:";
-  socket = new WebSocket(address);
+  document.documentElement.style.setProperty("--glass", glass.background);
+  fitGlass();
+  socket = new WebSocket("panel");
   socket.onmessage = event => {
     awaitState();
     show(JSON.parse(event.data));
   };
-  socket.onclose = connectAgain;
+  socket.onclose = () => connectAgain();
   awaitState();
 }
 
-new ResizeObserver(drawGlass).observe(element("glass"));
-setInterval(drawGlass, blinkTime / 4);
+// Another zoom, or another screen.
+function awaitResolution() {
+  fitGlass();
+  matchMedia(`(resolution: ${devicePixelRatio}dppx)`)
+    .addEventListener("change", awaitResolution, { once: true });
+}
+
+new ResizeObserver(fitGlass).observe(element("glass"));
+awaitResolution();
 connect();
