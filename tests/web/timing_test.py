@@ -1,8 +1,10 @@
 #!/usr/bin/python3
-"""Two emulators (the first argument) play the same journey for a minute: one alone, one with a page
-that is read, one that is not, and one that sends messages all the time. Compares what they traced."""
+"""Two emulators (the first argument) play the same journey for a minute: one alone, and one with as
+many pages as there may be, of which one is not read and one sends messages all the time. Compares what
+they traced."""
 
 import contextlib
+import selectors
 import socket
 import subprocess
 import sys
@@ -40,6 +42,16 @@ def send_until_closed(page):
             time.sleep(1 / 50)
 
 
+def read_until_closed(pages):
+    with selectors.DefaultSelector() as selector:
+        for page in pages:
+            selector.register(page.sock, selectors.EVENT_READ)
+        while selector.get_map():
+            for key, _ in selector.select():
+                if not key.fileobj.recv(65536):
+                    selector.unregister(key.fileobj)
+
+
 class Timing(unittest.TestCase):
     def test_pages_delay_neither_the_line_nor_the_answers(self):
         folder = self.enterContext(tempfile.TemporaryDirectory())
@@ -48,13 +60,14 @@ class Timing(unittest.TestCase):
         with Panel(EMULATOR, POLLER, "--journey", journey, "--trace", traces[1]) as panel, \
                 subprocess.Popen([EMULATOR, "--journey", journey, "--trace", traces[0], "--",
                                   *POLLER]) as alone:
-            seen, flood = panel.open(), panel.open()
+            seen, flood, *crowd = (panel.open() for _ in range(63))
             deaf = panel.open(sockopt=[(socket.SOL_SOCKET, socket.SO_RCVBUF, 2048)])
             memory = panel.memory()
             writers = [threading.Thread(target=send_until_closed, args=[page])
                        for page in (deaf, flood)]
             for writer in writers:
                 writer.start()
+            threading.Thread(target=read_until_closed, args=[crowd]).start()
             wait_for(seen, 60, polls=POLLS // 2)
             # By now the one that does not read has been dropped, and the one that sends has not.
             self.assertEqual([writer.is_alive() for writer in writers], [False, True])
