@@ -114,13 +114,14 @@ class InBrowser(unittest.TestCase):
         page.tap_until("E0 (eth0)", "192.0.2.10")
         page.tap("enter", "enter", "enter", "enter", "enter", "enter")
         page.expect("Enter IP Addr:", "192.  0.  2. 10", "Cursor on octet 4: 10")
-        page.run(WATCH_KEYS)
-        page.point("mouse", "up", {"type": "pointerDown", "button": 0})
-        page.wait("running", lambda: "10 polls: repeat" in page.text("held"))
-        self.assertEqual(page.rows()[1], "192.  0.  2. 10")  # it is read out when it has come to rest
         if PICTURE:
             page.browser.size(900, 464)
+        page.point("mouse", "up", {"type": "pointerDown", "button": 0})
+        page.wait("resting", lambda: "3 polls: rest" in page.text("held"))
+        if PICTURE:
             Path(PICTURE[0]).write_bytes(page.browser.driver.get_screenshot_as_png())
+        page.wait("running", lambda: "10 polls: repeat" in page.text("held"))
+        self.assertEqual(page.rows()[1], "192.  0.  2. 10")  # it is read out when it has come to rest
         page.point("mouse", "up", {"type": "pointerUp", "button": 0})
         page.wait("another octet", lambda: page.rows()[1] != "192.  0.  2. 10")
         octet = int(page.rows()[1][-3:])

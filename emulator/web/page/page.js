@@ -12,7 +12,7 @@ let opened = 0;       // how much had been recorded when the page was opened
 let glass = null;     // the display's measures and colours, and its characters' dots
 
 // The display. A dot is a square with a thin gap behind it, and as many whole pixels of the screen as
-// fit: pixels that are stretched would make dots uneven.
+// fit with another dot at either side: pixels that are stretched would make dots uneven.
 
 const blinkTime = 400;
 const stillness = matchMedia("(prefers-reduced-motion: reduce)");
@@ -22,7 +22,7 @@ function fitGlass() {
   if (!glass)
     return;
   const canvas = element("dots"), ratio = devicePixelRatio;
-  dot = Math.max(1, Math.floor(element("glass").clientWidth * ratio / glass.size[0]));
+  dot = Math.max(1, Math.floor(element("glass").clientWidth * ratio / (glass.size[0] + 2)));
   [canvas.width, canvas.height] = glass.size.map(dots => dots * dot);
   canvas.style.width = `${canvas.width / ratio}px`;
   canvas.style.translate = "0";
@@ -35,7 +35,7 @@ function drawGlass() {
   clearTimeout(blinkTimer);
   if (!state || !dot)
     return;
-  const { size, margin, pitch, glyph, glyphs, background, blankDot, darkDot } = glass;
+  const { size, pitch, glyph, glyphs, background, blankDot, darkDot } = glass;
   const pen = element("dots").getContext("2d");
   const gap = dot >= 4 ? Math.round(dot / 8) || 1 : 0;
   const isOn = stillness.matches || Math.floor(performance.now() / blinkTime) % 2 === 0;
@@ -47,8 +47,7 @@ function drawGlass() {
       for (let x = 0; x < glyph[0]; x++) {
         const isSet = glyphs[character][y] >> (glyph[0] - 1 - x) & 1;
         pen.fillStyle = isSet !== Number(hasCursor) ? darkDot : blankDot;
-        pen.fillRect((margin + column * pitch[0] + x) * dot, (margin + row * pitch[1] + y) * dot,
-                     dot - gap, dot - gap);
+        pen.fillRect((column * pitch[0] + x) * dot, (row * pitch[1] + y) * dot, dot - gap, dot - gap);
       }
   }));
   if (state.cursor && !stillness.matches)
