@@ -41,6 +41,8 @@ boost::asio::ip::tcp::endpoint parseEndpoint(const std::string &text) {
                                                     highestPort, "a port for --web"))};
 }
 
+constexpr const char *versionText = "panel-emulator " KESTROVA_VERSION "\n";
+
 struct OptionKind {
     const char *name;
     const char *value; // what stands for it in the help; null where there is none
@@ -81,8 +83,10 @@ constexpr std::array optionKinds{
                "ADDRESS it can be opened on this machine only; PORT 0 stands\n"
                "for any free port",
                [](Options &options, const char *value) { options.web = parseEndpoint(value); }},
+    OptionKind{"version", nullptr, "show the version",
+               [](Options &options, const char *) { options.answer = versionText; }},
     OptionKind{"help", nullptr, "show this text",
-               [](Options &options, const char *) { options.help = true; }},
+               [](Options &options, const char *) { options.answer = Options::helpText(); }},
 };
 
 // Where a file will be that is not there yet: behind its links.
@@ -141,10 +145,10 @@ Options Options::parse(int argc, char *const *argv) {
         if (optarg != nullptr && *optarg == '\0')
             throw std::invalid_argument(argument + " needs a value that is not empty");
         if (found == 'h')
-            options.help = true;
+            options.answer = helpText();
         else
             optionKinds.at(static_cast<std::size_t>(found)).apply(options, optarg);
-        if (options.help)
+        if (!options.answer.empty())
             return options;
     }
     options.command.assign(argv + optind, argv + argc);

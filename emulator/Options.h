@@ -12,7 +12,7 @@ namespace emulator {
 
 /// What panel-emulator was asked to do.
 struct Options {
-    bool help = false;
+    std::string answer; ///< what is printed and nothing else done; empty if a command is started
     bool fast = false;
     bool show = false;
     std::optional<std::string> journey; ///< file, or "-" for standard input

@@ -67,12 +67,12 @@ int main(int argc, char **argv) {
     try {
         const emulator::Options options = emulator::Options::parse(argc, argv);
         std::optional<emulator::Journey> journey;
-        if (!options.help)
+        if (options.answer.empty())
             journey = prepare(options);
         failed = exitFailed;
-        if (!options.help)
+        if (options.answer.empty())
             return emulator::Emulator(options, std::move(journey)).run();
-        if (!(std::cout << emulator::Options::helpText() << std::flush))
+        if (!(std::cout << options.answer << std::flush))
             throw std::runtime_error("cannot write to standard output");
         return EXIT_SUCCESS;
     } catch (const std::exception &error) {

@@ -13,6 +13,7 @@ from pathlib import Path
 
 EMULATOR = sys.argv.pop(1)
 ROOT = Path(__file__).resolve().parents[1]
+TOOLS = (EMULATOR, ROOT / "box/kestrova-panel-box")
 PAGES = [ROOT / "README.md", *sorted(ROOT.glob("docs/*.md"))]
 
 # A figure in a document, and the constant that it states.
@@ -44,8 +45,12 @@ def text_of(path):
     return (ROOT / path).read_text(encoding="utf-8")
 
 
+def said_by(tool, option):
+    return subprocess.run([tool, option], capture_output=True, text=True, check=True).stdout
+
+
 def help_of(tool):
-    return subprocess.run([tool, "--help"], capture_output=True, text=True, check=True).stdout
+    return said_by(tool, "--help")
 
 
 def table_under(heading, page):
@@ -62,7 +67,7 @@ def anchors_of(page):
 
 class Documents(unittest.TestCase):
     def test_help_and_the_manual_pages_list_the_same_options(self):
-        for tool in (EMULATOR, ROOT / "box/kestrova-panel-box"):
+        for tool in TOOLS:
             page = text_of(f"packaging/man/{os.path.basename(tool)}.1")
             listed = page.partition("The options are:")[2].partition(".El")[0]
             described = {f"-{option}" for items in re.findall(r"^\.It (Fl .*)", listed, re.M)
@@ -70,6 +75,12 @@ class Documents(unittest.TestCase):
             self.assertGreater(len(described), 5)
             self.assertEqual(set(re.findall(r"^  (?:-h, )?(--[a-z-]+)", help_of(tool), re.M)),
                              described)
+
+    def test_every_tool_tells_the_version_of_the_packages(self):
+        release = re.match(r"\S+ \((.*)-\d", text_of("debian/changelog"))[1]
+        self.assertIn(f"\n## {release}\n", text_of("CHANGELOG.md"))
+        for tool in TOOLS:
+            self.assertEqual(said_by(tool, "--version"), f"{os.path.basename(tool)} {release}\n")
 
     def test_help_and_the_manual_page_list_the_same_steps(self):
         def words(usages):

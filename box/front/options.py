@@ -5,7 +5,7 @@ import os
 import re
 
 from front.ending import wrong_usage
-from front.places import BOX
+from front.places import BOX, version
 
 
 class Parser(argparse.ArgumentParser):
@@ -60,8 +60,12 @@ COMMAND does not exist.""")
                         const="chatters", help="have it print on its standard output before it works")
     parser.add_argument("--enter", metavar="PID", type=whole_number,
                         help="run COMMAND in the running box whose kestrova-panel-box is process PID")
+    parser.add_argument("--version", action="store_true", help="show the version")
     end = words.index("--") if "--" in words else len(words)
     options, others = parser.parse_known_args(words[:end])
+    if options.version:
+        print(f"kestrova-panel-box {version()}")
+        raise SystemExit
     for other in others:
         wrong_usage(f"unknown option {other}" if other.startswith("-")
                     else "the command must follow after '--'")
