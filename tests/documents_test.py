@@ -93,9 +93,21 @@ class Documents(unittest.TestCase):
         self.assertEqual(words(re.findall(r"^  (\S.*?)(?:  |$)", steps, re.M)), words(listed))
 
     def test_the_journey_of_the_operators_guide_is_one_that_is_tested(self):
-        journey = text_of("docs/operator-guide.md").partition("\n```\n")[2].partition("```")[0]
-        self.assertIn("tap enter\n", journey)
+        journey = re.search("\n```\n(expect .*?)```", text_of("docs/operator-guide.md"), re.S)[1]
         self.assertIn(f"\n{journey}", text_of("tests/journeys/documents.journey"))
+
+    def test_the_operators_guide_has_the_text_of_every_screen(self):
+        guide = text_of("docs/operator-guide.md")
+
+        def screens(picture):
+            titles = re.findall("<title>(.*)</title>", text_of(f"docs/pictures/{picture}"))
+            return [[row.strip() for row in title.split("|")] for title in titles]
+
+        for alternative, picture in re.findall(r"!\[(.*)\]\(pictures/(.*\.svg)\)", guide):
+            self.assertEqual(alternative, " / ".join(screens(picture)[0]))
+        self.assertGreater(len(screens("map.svg")), 20)
+        for rows in screens("map.svg"):
+            self.assertIn("\n| " + " ".join(f"`{row}`" for row in rows) + " | ", guide)
 
     def test_figures_are_those_of_the_sources(self):
         for document, stated, source, constant in FIGURES:
