@@ -31,9 +31,9 @@ Runs COMMAND in a sandbox that looks like the appliance: it has an appliance's /
 and /opt/kestrova, and a host name, processes and network ports of its own. Nothing on the host
 is changed, and nothing is left behind. COMMAND starts in / with no other environment than
 PATH, HOME and TERM. Of the host it sees, read-only, /usr, six entries of /etc that the host's
-tools look things up in and, if the box may enter it, this checkout. It also sees a copy of its
-own file. If the appliance is rebooted from inside, COMMAND is ended with SIGTERM and started
-again.""",
+tools look things up in and, if this program belongs to a checkout that the box may enter, that
+checkout. It also sees a copy of its own file. If the appliance is rebooted from inside, COMMAND
+is ended with SIGTERM and started again.""",
         epilog="""\
 In a running box, /run/box/script-mode says what the script does (works, fails, chatters, or
 hangs SECONDS), and can be changed:

@@ -17,7 +17,7 @@ expect "faults of four manual pages" "4 " "$(find "$prefix/share/man" -type f | 
     mandoc -Tlint -W warning "$prefix"/share/man/man?/*)"
 
 cd "$prefix/share/doc/kestrova-panel" || exit 1
-expect "links of four guides to what is not installed" "4 " "$(ls ./*.md | wc -l) $(
+expect "links of four guides to what is not installed" "4 " "$(find . -name '*.md' | wc -l) $(
     grep -oh ']([^)#]*' ./*.md | cut -c 3- | xargs -I '{}' sh -c '[ -e "{}" ] || echo "{}"')"
 expect "versions of the tools" 1 "$(for tool in panel-emulator kestrova-panel-box; do
     "$prefix/bin/$tool" --version | cut -d " " -f 2; done | uniq | wc -l)"
