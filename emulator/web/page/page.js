@@ -89,9 +89,9 @@ let sayTimer = 0, changedSince = null;
 // While a key is down it may change all the time, so it is read when the key has come up.
 function sayRows() {
   clearTimeout(sayTimer);
+  changedSince = state.down ? null : changedSince ?? performance.now();
   if (state.down)
     return;
-  changedSince ??= performance.now();
   sayTimer = setTimeout(() => {
     changedSince = null;
     [...state.rows, describeCursor(state)].forEach((text, row) => {
