@@ -1,5 +1,6 @@
 """The host's files that are copied into the box."""
 
+import errno
 import io
 import os
 import re
@@ -7,9 +8,20 @@ import stat
 import tarfile
 import time
 
-from front.ending import NO_COMMAND, NO_RUN, end_with, no_box
+from front.ending import NO_COMMAND, NO_RUN, end_with
 
 HOST_NAME_MAX = 64
+
+
+def open_regular(path):
+    """Opens an ordinary file to be read as bytes. Raises OSError for anything else, and never waits."""
+    # A device is not even opened, because that may do something.
+    if stat.S_ISREG(os.stat(path).st_mode):
+        file = open(os.open(path, os.O_RDONLY | os.O_NONBLOCK), "rb")
+        if stat.S_ISREG(os.fstat(file.fileno()).st_mode):
+            return file
+        file.close()
+    raise OSError(errno.EINVAL, "not a regular file", path)
 
 
 class Archive:
@@ -38,10 +50,8 @@ class Archive:
         self.add(name, tarfile.REGTYPE, 0o644, len(content), io.BytesIO(content))
 
     def add_file(self, path, name):
-        with open(os.open(path, os.O_RDONLY | os.O_NONBLOCK), "rb") as file:
+        with open_regular(path) as file:
             status = os.fstat(file.fileno())
-            if not stat.S_ISREG(status.st_mode):
-                no_box(f"{path} is not a regular file")
             # The root of the box copies it again, and may not read a file that nobody may read.
             mode = stat.S_IMODE(status.st_mode) & 0o777 | 0o400
             self.add(name, tarfile.REGTYPE, mode, status.st_size, file)
@@ -78,11 +88,11 @@ def open_command(command):
 
 
 def check_host_name(path):
-    """Checks the name by the rules of `hostname -F`, which sets it in the box."""
+    """Checks the name by the rules of `hostname -F`, which sets it in the box, and raises ValueError."""
     if not os.path.isfile(path):
         return
     with open(path, encoding="latin-1") as lines:
         names = [line.strip() for line in lines if line.strip() and not line.startswith("#")]
     label = "[A-Za-z0-9]([A-Za-z0-9-]*[A-Za-z0-9])?"
     if not names or len(names[0]) > HOST_NAME_MAX or not re.fullmatch(rf"{label}(\.{label})*", names[0]):
-        no_box(f"{path} does not contain a host name")
+        raise ValueError(f"{path} does not contain a host name")
