@@ -109,6 +109,9 @@ class Documents(unittest.TestCase):
         for rows in screens("map.svg"):
             self.assertIn("\n| " + " ".join(f"`{row}`" for row in rows) + " | ", guide)
 
+    def test_the_example_of_the_integrators_guide_is_the_file(self):
+        self.assertIn("```sh\n" + text_of("docs/examples/apply.sh") + "```\n", text_of("docs/integration.md"))
+
     def test_figures_are_those_of_the_sources(self):
         for document, stated, source, constant in FIGURES:
             with self.subTest(stated):

@@ -53,7 +53,7 @@ mkfifo "$root/root/there"
 
 # The two scripts, as delivered, and with a gate at the point where they have taken the port down or
 # are about to change the name.
-sed -n '/^#!/,/^```/{/^```/!p}' "$here/../../docs/integration.md" >"$root/root/example"
+cp "$here/../../docs/examples/apply.sh" "$root/root/example"
 cp "$here/../../box/appliance/opt/kestrova/scripts/ezio/apply.py" "$root/root/stand-in"
 gate=/opt/kestrova/gate
 mkdir -p "$root$gate"
