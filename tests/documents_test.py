@@ -67,7 +67,7 @@ def anchors_of(page):
 
 class Documents(unittest.TestCase):
     def test_help_and_the_manual_pages_list_the_same_options(self):
-        for tool in TOOLS:
+        for tool in (*TOOLS, ROOT / "check/kestrova-appliance-check"):
             page = text_of(f"packaging/man/{os.path.basename(tool)}.1")
             listed = page.partition("The options are:")[2].partition(".El")[0]
             described = {f"-{option}" for items in re.findall(r"^\.It (Fl .*)", listed, re.M)

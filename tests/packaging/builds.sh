@@ -24,7 +24,7 @@ without_tests=-DCMAKE_DISABLE_FIND_PACKAGE_GTest=ON # as if GoogleTest were not 
 try program -DKESTROVA_TOOLS=OFF $without_tests
 expect "program alone" sbin/kestrova-panel "$(installed)"
 try default $without_tests
-expect "program and tools" "bin/kestrova-panel-box bin/panel-emulator sbin/kestrova-panel" \
+expect "program and tools" "bin/kestrova-appliance-check bin/kestrova-panel-box bin/panel-emulator sbin/kestrova-panel" \
     "$(installed)"
 try tests -DKESTROVA_TOOLS=OFF -DBUILD_TESTING=ON
 try release -DBUILD_TESTING=ON -DCMAKE_BUILD_TYPE=Release -DKESTROVA_WERROR=OFF

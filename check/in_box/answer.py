@@ -1,0 +1,41 @@
+#!/usr/bin/python3 -BIS
+"""Answers one question about the appliance from inside the box: QUESTION DETAILS, both in JSON's terms.
+
+The answer is the last line on standard output.
+"""
+
+import json
+import os
+import sys
+
+sys.path.append(os.path.dirname(os.path.dirname(os.path.realpath(__file__))))
+
+import live_checks
+from in_box.meaning import meaning
+from in_box.panel import pages, settings
+
+
+def live(name, trial):
+    """The faults that a live check finds, or why it has to be skipped."""
+    check = next(check for check in live_checks.CHECKS if check.name == name)
+    faults = []
+    try:
+        for fault in check.function(live_checks.Trial(**trial)):
+            faults.append(fault)
+    except live_checks.TooLong as fault:
+        faults.append(str(fault))
+    except live_checks.Skip as reason:
+        return {"skip": str(reason)}
+    return {"faults": faults}
+
+
+QUESTIONS = {
+    "pages": pages,
+    "settings": lambda port, address: {"panel": settings([(port, address)])[0], "meaning": meaning(port)},
+    "live": live,
+}
+
+answer = QUESTIONS[sys.argv[1]](**json.loads(sys.argv[2]))
+print(json.dumps(answer), flush=True)
+# What a script has left running ends with the box.
+os._exit(0)

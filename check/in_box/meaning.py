@@ -1,0 +1,35 @@
+"""What the interfaces file means to ifupdown, which is asked by its own tools."""
+
+import re
+import shutil
+import subprocess
+
+INTERFACES = "/etc/network/interfaces"
+
+
+def ask(*command):
+    return subprocess.run([*command, "--interfaces", INTERFACES], stdin=subprocess.DEVNULL,
+                          capture_output=True, text=True, errors="surrogateescape")
+
+
+def is_ipv6(option, value):
+    return ":" in value or option == "netmask" and value.isdigit()
+
+
+def meaning(port):
+    """The port's IPv4 settings as words of the configuration script, [] if it has none, or None
+    without ifupdown."""
+    if not shutil.which("ifquery"):
+        return None
+    # What is printed for a stanza comes in the order of the file, so that an IPv4 stanza's values are
+    # the last that are not those of IPv6.
+    values = {}
+    for option, value in re.findall(r"^(address|netmask|gateway): (.*)$", ask("ifquery", port).stdout, re.M):
+        if not is_ipv6(option, value):
+            values[option] = value
+    if "address" in values:
+        words = ["--ipaddress", values["address"], "--netmask", values.get("netmask", "")]
+        return words + (["--gateway", values["gateway"]] if "gateway" in values else [])
+    steps = ask("ifup", "--no-act", "--force", "--no-scripts", port)
+    takes_lease = re.search("udhcpc|dhclient|dhcpcd|pump|DHCP client", steps.stdout + steps.stderr)
+    return ["--dhcp"] if takes_lease else []

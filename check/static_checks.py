@@ -1,0 +1,334 @@
+"""The checks of what lies there before the appliance has ever been started.
+
+What the program makes of the files is not worked out here: the program itself is played in the box and
+shows it, and ifupdown says what the interfaces file means.
+"""
+
+import concurrent.futures
+import functools
+import ipaddress
+import os
+import re
+import shutil
+import subprocess
+
+from appliance import HOST_NAME, INTERFACES, MODEL, READ_FILES, RESOLVER, SCRIPT
+from checks import Check, Skip
+from in_box.panel import without_servers
+from play import Stage
+
+ALWAYS_LISTED = 2  # the program lists eth4 and eth5 in any case
+FIXED_PAGES = 3
+ROW_LENGTH = 16
+MOST_LISTED_SERVERS = 10
+PORT_ADDRESS = "192.0.2.200"  # by which a port's page is found
+KNOWN_MODEL = "q70\n"
+IMAGE_PATH = "/usr/local/sbin:/usr/local/bin:/usr/sbin:/usr/bin:/sbin:/bin"
+IMAGE_LIMIT_S = 20
+BOOT_FILES = ("boot/grub/grub.cfg", "boot/cmdline.txt", "boot/firmware/cmdline.txt",
+              "boot/extlinux/extlinux.conf", "boot/loader/entries")
+UNIT_FOLDERS = ("usr/lib/systemd/system", "lib/systemd/system", "usr/local/lib/systemd/system")
+USES_LINE = re.compile(r"^(?!\s*[#;]).*(ttyS1\b|serial .*--unit=1\b).*", re.M)
+TOOLS = "stty ifconfig hostname awk sed grep egrep sort tr head cat env kill"
+TRY_SHELL = f"""echo "1\\n2"
+for tool in {TOOLS}; do command -v $tool >/tmp/none 2>&1 || echo "missing $tool"; done"""
+
+STANZA_WORD = r"(?:iface|auto|allow-|mapping|source|no-auto-down|no-scripts)"
+# What in a port's stanza makes the program read it otherwise than ifupdown, and how to say so.
+CAUSES = [
+    (r"^iface\s+{port}\s+inet6", "an inet6 stanza comes first: put the inet stanza before it"),
+    (r"^[ \t]+iface\s+{port}\s", "there is a blank before iface: begin the line with iface"),
+    (r"^iface(?=\s+{port}\s)(?! {port} inet[ \t])", "the iface line has a tab or more than one space"),
+    (r"^iface\s+{port}\s.*#", "there is a comment on the iface line: give it a line of its own"),
+    (r"^iface\s+{port}\s.*[ \t]$", "there is a blank at the end of the iface line: remove it"),
+    (r"^\s*(address|netmask|gateway).*#", "there is a comment behind a value: give it a line of its own"),
+    (r"^\s*(address|netmask|gateway)[ ]*\t", "there is a tab before a value: use a space"),
+    (r"^\s*(address|netmask|gateway).*[ \t]$", "there is a blank at the end of a line: remove it"),
+    (r"^\s*address\s+\S+/[0-9]+", "the address has a prefix length: write a netmask line"),
+    (r"^\s*(?!address|netmask|gateway)\S*(address|netmask|gateway)",
+     "another word contains address, netmask or gateway, and is read as that: put its line above these"),
+    (r"\\$", "a line goes on in the next one: write it as one line"),
+    (rf"^iface\s+{{port}}\s.*\n(.*\S.*\n)*[ \t]*{STANZA_WORD}",
+     "no empty line follows the stanza: the next one is read as part of it"),
+    (r"\A(?s:(?!.*netmask))", "there is no netmask: write a netmask line"),
+    (r"^[ \t]+$",
+     "a line of blanks follows the stanza instead of an empty one: the next one is read as part of it"),
+]
+
+
+class Subject:
+    """The appliance, and what the program showed when it was played in the box."""
+
+    def __init__(self, appliance, programs, work):
+        self.appliance = appliance
+        self.programs = programs
+        self.work = work
+
+    @functools.cached_property
+    def ports(self):
+        try:
+            return self.appliance.ports()
+        except ValueError as fault:
+            raise Skip(f"the ports cannot be made: {fault}") from None
+
+    @functools.cached_property
+    def stage(self):
+        stage = Stage(self.appliance, self.programs, self.work)
+        # Each port has to have an address, because others get no page.
+        stage.write("links", "".join(
+            f"{name} {address if address != '-' else f'198.18.{number}.1/24'}\n"
+            for number, (name, address) in enumerate(self.ports.items())))
+        return stage
+
+    def left_out(self):
+        """What is in none of the boxes, each with the reason."""
+        return self.stage.left_out if "stage" in vars(self) else []
+
+    def settings_of(self, port):
+        alone = self.stage.copy(self.work)
+        alone.write("links", f"{port} {PORT_ADDRESS}/24\n")
+        alone.write(MODEL, KNOWN_MODEL)
+        return alone.ask("settings", port=port, address=PORT_ADDRESS)
+
+    @functools.cached_property
+    def played(self):
+        """All pages, and the settings of each port that has some; the boxes are there at the same time."""
+        settable = [port for port in self.ports if port.startswith("eth")]
+        count = FIXED_PAGES + ALWAYS_LISTED + len(self.ports)
+        with concurrent.futures.ThreadPoolExecutor(1 + len(settable)) as pool:
+            shown = pool.submit(self.stage.ask, "pages", count=count)
+            read = {port: pool.submit(self.settings_of, port) for port in settable}
+            pages = shown.result()
+            again = next((number for number, page in enumerate(pages) if number and page == pages[0]), count)
+            return pages[:again], {port: answer.result() for port, answer in read.items()}
+
+    @property
+    def pages(self):
+        return self.played[0]
+
+    @property
+    def settings(self):
+        return self.played[1]
+
+
+def script(subject):
+    appliance, place = subject.appliance, subject.appliance.place(SCRIPT)
+    if not os.path.exists(place):
+        folder = os.path.dirname(place)
+        beside = " ".join(sorted(os.listdir(folder))) if os.path.isdir(folder) else ""
+        yield f"/{SCRIPT} is missing" + (f"; beside its place there is: {beside}" if beside else "")
+        return
+    fault = appliance.kind_fault(SCRIPT)
+    if fault:
+        yield f"/{SCRIPT} {fault}"
+        return
+    if not os.stat(place).st_mode & 0o100:
+        yield f"/{SCRIPT} is not executable"
+    first = appliance.text(SCRIPT).partition("\n")[0]
+    interpreter = re.match(r"#!\s*([^ \t]+)", first)
+    if not interpreter and not appliance.text(SCRIPT).startswith("\x7fELF"):
+        yield f"/{SCRIPT} does not begin with #! and an interpreter"
+    elif interpreter and not (appliance.exists(interpreter[1][1:]) if appliance.is_image
+                              else os.path.exists(interpreter[1])):
+        yield f"its interpreter {interpreter[1]!r} does not exist"
+
+
+def ordinary_files(subject):
+    for name in READ_FILES:
+        fault = subject.appliance.kind_fault(name)
+        if fault:
+            yield f"/{name} {fault}"
+
+
+def host_name(subject):
+    fault = subject.appliance.host_name_fault()
+    if fault:
+        yield f"/{HOST_NAME} {fault}"
+
+
+def ports(subject):
+    try:
+        if not any(port.startswith("eth") for port in subject.appliance.ports()):
+            yield "there is no port whose name begins with eth, so that no port can be set at the panel"
+    except ValueError as fault:
+        yield str(fault)
+
+
+def model(subject):
+    if not any(subject.pages[0]):
+        first = subject.appliance.text(MODEL).partition("\n")[0]
+        yield f"the product page is blank: /{MODEL} begins with {first!r}"
+
+
+def label_of(subject, name):
+    """What stands before the port's name on its page, or None if it has no page."""
+    for row, _ in subject.pages[1:]:
+        label, bracket, rest = row.partition("(")
+        cut_off = len(row) == ROW_LENGTH
+        if bracket and (rest == f"{name})" or cut_off and f"{name})".startswith(rest)):
+            return label.strip()
+    return None
+
+
+def port_pages(subject):
+    labels = {name: label_of(subject, name) for name in subject.ports}
+    for name, label in labels.items():
+        same = [other for other in labels if other != name and labels[other] == label]
+        if label is None:
+            yield f"{name} has no page of its own, or one that reads only \"undefined\""
+        elif not label:
+            yield f"the page of {name} has no label"
+        elif same or re.fullmatch("eth[0-9]{2,}", name):
+            yield f"the page of {name} has the label {label}, which is that of {' '.join(same) or label.lower()}"
+
+
+def likely_cause(text, port):
+    """What in the file makes the program read the port otherwise."""
+    name = re.escape(port)
+    # The stanza, and the line with which the next one begins.
+    stanza = re.search(rf"^[ \t]*iface\s+{name}\s.*\n(?:(?!\s*{STANZA_WORD}).*\n)*.*", text, re.M)
+    if not stanza:
+        if re.search(r"^\s*source", text, re.M):
+            return "its stanza is in a file that a source line names: move it into this file"
+        return f"there is no stanza \"iface {port} inet ...\""
+    for pattern, cause in CAUSES:
+        if re.search(pattern.replace("{port}", name), stanza[0], re.M):
+            return cause
+    return "compare the stanza with the integrator's guide"
+
+
+def interfaces(subject):
+    appliance = subject.appliance
+    text = appliance.text(INTERFACES)
+    if not text:
+        yield f"/{INTERFACES} is missing or empty: every port is shown as a static one without an address"
+        return
+    for port, answer in subject.settings.items():
+        if answer["meaning"] is None:
+            raise Skip("ifquery is missing: run apt-get install ifupdown")
+        read = without_servers(answer["panel"]["words"] or [])
+        if read != answer["meaning"]:
+            shown = " ".join(read) or answer["panel"]["shown"]
+            yield f"{port}: the panel reads {shown!r}, but to ifupdown the file means " \
+                  f"{' '.join(answer['meaning']) or 'no address'!r}: {likely_cause(text, port)}"
+
+
+def resolver(subject):
+    appliance = subject.appliance
+    inner = appliance.inner_place(RESOLVER)
+    if "systemd/resolve" in inner:
+        yield f"/{RESOLVER} leads to {inner}: the panel lists the resolver on the appliance itself"
+    servers = []
+    for line in appliance.text(RESOLVER).split("\n"):
+        words = line.split()
+        if words[:1] != ["nameserver"]:
+            continue
+        server = words[1] if len(words) > 1 else ""
+        servers.append(server)
+        if line != f"nameserver {server}":
+            yield f"{line!r} is not \"nameserver\", one space, and an address"
+        try:
+            address = ipaddress.ip_address(server)
+        except ValueError:
+            yield f"{server!r} is not an address"
+            continue
+        if address.version != 4:
+            yield f"the server {server} has an IPv6 address"
+        elif address.is_loopback:
+            yield f"the server {server} is a resolver on the appliance itself"
+    if len(servers) > MOST_LISTED_SERVERS:
+        yield f"there are {len(servers)} servers, and the panel lists {MOST_LISTED_SERVERS}"
+    called = [answer["panel"]["words"] for answer in subject.settings.values() if answer["panel"]["words"]]
+    for words in called[:1]:
+        handed_on = [word for before, word in zip(words, words[1:]) if before == "--dns"]
+        if handed_on != servers:
+            yield f"the file names {servers}, and the panel hands on {handed_on}"
+
+
+def shell(subject):
+    """The image's own shell, or, where there is no image, the one that the box has from this machine."""
+    if subject.appliance.is_image:
+        done = subprocess.run(
+            ["bwrap", "--ro-bind", subject.appliance.root, "/", "--tmpfs", "/tmp", "--unshare-all",
+             "--clearenv", "--setenv", "PATH", IMAGE_PATH, "/bin/sh", "-c", TRY_SHELL],
+            stdin=subprocess.DEVNULL, capture_output=True, text=True, errors="replace", timeout=IMAGE_LIMIT_S)
+        if done.returncode != 0:
+            raise Skip(f"the image's shell cannot be run here: {done.stderr.strip()}")
+        said = done.stdout
+    else:
+        said = subject.stage.run("/bin/sh", "-c", TRY_SHELL)
+    if not said.startswith("1\n2\n"):
+        yield "the echo of /bin/sh does not turn \\n into a line feed: three pages are missing"
+    for tool in re.findall("^missing (.*)", said, re.M):
+        yield f"the command {tool} is missing"
+
+
+def image_only(subject):
+    if not subject.appliance.is_image:
+        raise Skip("only the root of an image can tell")
+
+
+def ipv6(subject):
+    image_only(subject)
+    off = re.compile(r"^\s*-?net[./]ipv6[./]conf[./](all|default)[./]disable_ipv6\s*=\s*1|ipv6\.disable=1|"
+                     r"addrgenmode\s+none|^\s*LinkLocalAddressing\s*=\s*(no|ipv4)", re.M)
+    files = subject.appliance.files_below("etc", "usr/lib/sysctl.d", *BOOT_FILES)
+    if not any(off.search(subject.appliance.text(file)) for file in files):
+        yield "nothing switches IPv6 off: a port without an IPv4 address would show one that begins with fe80"
+
+
+def serial_line(subject):
+    image_only(subject)
+    kept_away = any(subject.appliance.exists(f"{folder}/serial-getty@ttyS1.service.d/kestrova-panel.conf")
+                    for folder in UNIT_FOLDERS)
+    seen = set()
+    for file in subject.appliance.files_below("etc", *UNIT_FOLDERS, *BOOT_FILES):
+        place = subject.appliance.place(file)
+        if "kestrova-panel" in file or file == "etc/securetty":
+            continue
+        if os.path.basename(file) == "serial-getty@ttyS1.service":
+            if not kept_away:
+                yield f"/{file} starts a login prompt on the line"
+        elif place not in seen:
+            seen.add(place)
+            uses = USES_LINE.search(subject.appliance.text(file))
+            if uses:
+                yield f"/{file} uses the line: {uses[0].strip()}"
+
+
+def service(subject):
+    image_only(subject)
+    if not shutil.which("systemctl"):
+        raise Skip("systemctl is missing: run apt-get install systemd")
+    if not any(subject.appliance.exists(f"{folder}/systemd/systemd") for folder in ("usr/lib", "lib")):
+        raise Skip("the image has no systemd")
+    done = subprocess.run(
+        ["systemctl", f"--root={subject.appliance.root}", "is-enabled", "kestrova-panel.service"],
+        stdin=subprocess.DEVNULL, capture_output=True, text=True, timeout=IMAGE_LIMIT_S)
+    if done.stdout.strip() != "enabled":
+        yield f"kestrova-panel.service is {done.stdout.strip() or done.stderr.strip()}"
+
+
+CHECKS = [
+    Check("the configuration script can be run", script,
+          f"install it as /{SCRIPT}, with mode 755, and its interpreter with it"),
+    Check("the files that the program reads are ordinary files", ordinary_files,
+          "put an ordinary file there: at anything else the program stands still or grows without end"),
+    Check("the host name is one", host_name,
+          f"write one line with letters, digits, hyphens and dots into /{HOST_NAME}"),
+    Check("the ports can be made", ports,
+          "name the network ports eth0 to eth7, or list them in links (kestrova-panel-box(1))"),
+    Check("the model is known", model, f"begin the first line of /{MODEL} with q70, q75 or zvm"),
+    Check("each port has a page with a label of its own", port_pages,
+          "name the ports eth0 to eth7, and bridges bridge0 and bridge1 (net.ifnames=0, or .link files)"),
+    Check("the settings of the ports are read as they are meant", interfaces,
+          f"change /{INTERFACES} so that the panel reads what ifupdown does"),
+    Check("the DNS servers are read as they are meant", resolver,
+          f"list up to ten servers by their IPv4 addresses in /{RESOLVER}, and none of the appliance itself"),
+    Check("the shell and the commands are those that the program needs", shell,
+          "make dash the /bin/sh, and install net-tools, hostname, mawk, sed, grep, coreutils and procps"),
+    Check("IPv6 is off", ipv6, "set net.ipv6.conf.all.disable_ipv6 = 1 in a file in /etc/sysctl.d"),
+    Check("nothing else uses the serial line", serial_line,
+          "give the login prompts, the kernel's console and other programs another line"),
+    Check("the service is enabled", service, "run systemctl --root=IMAGE enable kestrova-panel"),
+]

@@ -1,0 +1,174 @@
+#!/usr/bin/python3
+"""Plants one fault after the other in an appliance, or in the script of one, and wants each to be found by
+the check that is for it. The first argument is the folder of kestrova-panel and panel-emulator; without
+it, what is installed is tested.
+"""
+
+import concurrent.futures
+import re
+import shutil
+import subprocess
+import sys
+import tempfile
+import unittest
+from pathlib import Path
+
+ROOT = Path(__file__).resolve().parents[2]
+CHECK = ["kestrova-appliance-check"]
+if sys.argv[1:] and Path(sys.argv[1]).is_dir():
+    CHECK = [ROOT / "check" / CHECK[0], "--programs", sys.argv.pop(1)]
+SCRIPT = "opt/kestrova/scripts/ezio/apply.py"
+
+# An image is an appliance with these. The commands need not work, because the check only looks for them.
+IMAGE = r"""
+mkdir -p usr/bin usr/lib/systemd/system etc/sysctl.d etc/systemd/system/dev-ttyS1.device.wants tmp
+ln -s usr/bin bin; ln -s usr/lib lib; touch usr/lib/systemd/systemd
+for tool in stty ifconfig hostname awk sed grep egrep sort tr head cat env kill; do
+    printf '#!/bin/sh\n' >bin/$tool; chmod +x bin/$tool; done
+cp --parents -L $(ldd /bin/bash /bin/dash | grep -oE '/[^ :]+' | sort -u) /bin/dash . 2>/dev/null
+cp /usr/bin/python3 bin/python3; cp /bin/dash bin/sh
+printf '[Install]\nWantedBy=dev-ttyS1.device\n' >lib/systemd/system/kestrova-panel.service
+ln -s /usr/lib/systemd/system/kestrova-panel.service etc/systemd/system/dev-ttyS1.device.wants/
+echo net.ipv6.conf.all.disable_ipv6 = 1 >etc/sysctl.d/panel.conf
+"""
+STANZAS = r"""
+names='eth0 eth1 eth2 eth3 eth4 eth5 eth6 eth7 eth8 eth9 eth10 eth11 eth12 eth13 eth14'
+for name in $names; do echo "$name -"; done >links
+mkdir etc/network/interfaces.d
+static() { printf "$2iface$3$1 inet static$4\n  address$5 10.0.${1#eth}.1$6\n  netmask 255.255.255.0\n$7"; }
+{ static eth0 '' ' ' '' '' ''; static eth1 '' ' ' '' '' '' '\n'
+printf 'iface eth2 inet6 auto\n\n'; static eth2 '' ' ' '' '' '' '\n'
+static eth3 ' ' ' ' '' '' '' '\n'; static eth4 '' '\t' '' '' '' '\n'
+printf 'iface eth5 inet dhcp # here\n\niface eth6 inet dhcp \n\n'
+static eth7 '' ' ' '' '' ' # here' '\n'; static eth9 '' ' ' '' '' ' ' '\n'
+static eth10 '' ' ' '' '' '/24' '\n'
+printf 'iface eth8 inet static\n\taddress\t10.0.0.1\n\tnetmask\t255.255.255.0\n\n'
+static eth11 '' ' ' '' '' '' '  hwaddress ether 02:00:00:00:00:01\n\n'
+static eth12 '' ' ' '' ' \\\n' '' '\n'; static eth13 '' ' ' '' '' '' ' \n'
+static lo '' ' ' '' '' '' '\n'
+echo 'source /etc/network/interfaces.d/*'; } >etc/network/interfaces
+static eth14 '' ' ' '' '' '' >etc/network/interfaces.d/more
+"""
+SERVERS = r"""{ printf 'nameserver\t9.9.9.9\nnameserver 2001:db8::1\n'
+printf 'nameserver 127.0.0.53\nnameserver 9.9.9.9 \n'
+seq -f 'nameserver 9.9.9.%g' 8; } >etc/resolv.conf"""
+
+# How an appliance is broken, by which check this is found, and what the check says, each in a line.
+APPLIANCES = [
+    (f"mv {SCRIPT} {SCRIPT}.sh", "configuration script", ["is missing; beside .*: apply.py.sh"]),
+    (f"chmod -x {SCRIPT}; sed -i '1s/$/\\r/' {SCRIPT}", "configuration script",
+     ["not executable", r"python3\\r' does not"]),
+    (f"rm {SCRIPT}; mkdir {SCRIPT}", "configuration script", ["is a directory"]),
+    ("rm etc/ma-platform; mkfifo etc/ma-platform; ln -sf /dev/zero etc/resolv.conf; cd opt/kestrova; rm seq*; "
+     "mkdir seq.site_conn; truncate -s 9G config/nis.config", "ordinary",
+     ["ma-platform is a FIFO", "resolv.conf leads to /dev/zero", "site_conn is a directory", "9663676416 bytes"]),
+    ("echo two words >etc/hostname", "host name is", ["does not contain a host name"]),
+    ("echo enp3s0 192.0.2.1/24 >links", "ports can", ["no port whose name begins with eth"]),
+    ("echo Q75 >etc/ma-platform", "model", ["begins with 'Q75'"]),
+    ("for name in enp3s0 bridge2 eth10 eth9 eth0 eth0.7 evil0; do echo $name -; done >links", "label",
+     ["enp3s0 has no page", "bridge2 has no label", "eth10 has the label E1", "eth9 has no label",
+      "eth0 has the label E0", "eth0.7 has the label E0", "evil0 has no page"]),
+    (STANZAS, "settings", [
+        f"eth{number}: the panel .*{cause}" for number, cause in enumerate([
+            "no empty line follows", None, "inet6 stanza comes first", "blank before iface", "a tab or more",
+            "comment on the iface", "blank at the end of the iface", "comment behind a value",
+            "tab before a value", "blank at the end of a line", "prefix length", "another word", "goes on",
+            "line of blanks", "source line"])
+        if cause]),
+    ("rm etc/network/interfaces", "settings", ["is missing or empty"]),
+    (SERVERS, "servers are", [r"nameserver\\t9.9.9.9' is not", "2001:db8::1 has an IPv6", "53 is a resolver",
+                              "9.9.9.9 ' is not", "there are 12 servers", "the panel hands on"]),
+    ("ln -sf ../run/systemd/resolve/stub-resolv.conf etc/resolv.conf", "servers are",
+     ["resolver on the appliance"]),
+    (IMAGE + "cp /bin/bash bin/sh; rm bin/ifconfig", "shell", ["does not turn", "ifconfig is missing"]),
+    (IMAGE + "rm etc/sysctl.d/panel.conf", "IPv6", ["nothing switches IPv6 off"]),
+    (IMAGE + "mkdir etc/default etc/systemd/system/getty.target.wants; echo LINUX=console=ttyS1 >etc/default/grub;"
+     "ln -s /dev/null etc/systemd/system/getty.target.wants/serial-getty@ttyS1.service", "serial",
+     ["default/grub uses the line", "starts a login prompt"]),
+    (IMAGE + "rm -r etc/systemd/system/dev*", "service", ["kestrova-panel.service is disabled"]),
+]
+
+# A line of the stand-in's script, what stands there instead, and what finds it.
+SCRIPTS = [
+    ('logging.info("done")', 'print("0 errors")', "prints nothing"),
+    ("        if settings.dhcp:\n", '        subprocess.Popen(["sleep", "300"])\n        if settings.dhcp:\n',
+     "hold its output"),
+    ("    if settings.gateway:\n        run(", "    if False:\n        run(", "sets a static"),
+    ("def main(arguments):\n",
+     "def main(arguments):\n    if os.fork():\n        return 0\n    os.close(1)\n    time.sleep(1)\n", "returns when"),
+    ("            bring_up_dhcp(settings)", "            pass", "takes a lease"),
+    ("str(DHCP_DISCOVERS)", '"99"', "gives up"),
+    ('if line.split()[:1] != ["nameserver"]]', "]", "complete list"),
+    ("        yield\n        os.rename(ready, path)", "        os.rename(ready, path)\n        yield",
+     "puts the files back"),
+    ("with no_other_at_work():", "if True:", "one change at a time"),
+    ("    try:\n        logging", "    signal.signal(signal.SIGHUP, signal.SIG_DFL)\n    try:\n        logging",
+     "goes on"),
+    ('    run("ifconfig"', '    open("/tmp/x", "w")\n    run("ifconfig"', "is killed"),
+    ('    run("ifconfig"', '    print("up", flush=True)\n    run("ifconfig"', "crashes"),
+    ("        return 2\n", "        return 0\n", "refuses"),
+    ('own = words[:3] == ["iface", port, "inet"]', 'own = words[:1] == ["iface"]', "other ports"),
+    ('                result.append("")', "                pass", "other ports"),
+    ("os.rename(ready, path)", "path.write_text(ready.read_text())", "one step"),
+    ('str(settings.netmask), "up")', 'str(settings.netmask), "down")', "panel shows"),
+    ('run("reboot")', "pass", "reboots"),
+]
+
+
+class Checked(unittest.TestCase):
+    def setUp(self):
+        self.work = Path(tempfile.mkdtemp())
+        self.addCleanup(shutil.rmtree, self.work)
+
+    def check(self, name, change, *options):
+        """The status and the output for the project's own appliance, after a shell has changed it."""
+        appliance = self.work / name
+        shutil.copytree(ROOT / "box/appliance", appliance)
+        subprocess.run(["sh", "-ec", change], cwd=appliance, check=True)
+        done = subprocess.run([*CHECK, *options, appliance], capture_output=True, text=True)
+        return done.returncode, done.stdout + done.stderr
+
+    def at_once(self, cases):
+        """Plays the checks side by side, because they mostly wait."""
+        with concurrent.futures.ThreadPoolExecutor(len(cases)) as pool:
+            return pool.map(lambda case: self.check(*case), cases)
+
+    def test_faults_of_appliances(self):
+        cases = [(f"{number}", change, "--only", name) for number, (change, name, _) in enumerate(APPLIANCES)]
+        for (_, name, said), (status, output) in zip(APPLIANCES, self.at_once(cases)):
+            with self.subTest(name):
+                self.assertRegex(output, rf"^TAP version 13\n1..1\nnot ok 1 - .*{name}.*\n")
+                found = re.findall("^# (?!->).*", output, re.M)
+                self.assertEqual((status, len(found)), (1, len(said)), output)
+                for each in said:
+                    self.assertRegex(output, each)
+
+    def test_faults_of_scripts(self):
+        text = (ROOT / "box/appliance" / SCRIPT).read_text(encoding="utf-8")
+        cases = []
+        for number, (old, new, name) in enumerate(SCRIPTS):
+            self.assertIn(old, text)
+            (self.work / f"{number}.py").write_text(text.replace(old, new, 1), encoding="utf-8")
+            cases.append((f"{number}", f"cp ../{number}.py {SCRIPT}", "--live", "--limit", "12", "--only", name))
+        for (old, _, name), (status, output) in zip(SCRIPTS, self.at_once(cases)):
+            with self.subTest(old=old):
+                self.assertRegex(output, f"(?m)^not ok .*{name}")
+                self.assertNotRegex(output, "(?m)^ok")
+                self.assertEqual(status, 1)
+
+    def test_appliances_without_faults(self):
+        example = f"cp '{ROOT}/docs/examples/apply.sh' {SCRIPT}"
+        cases = [("stand-in", "true", "--live"), ("image", IMAGE + example, "--live")]
+        for (status, output), skipped in zip(self.at_once(cases), (3, 0)):
+            lines = re.findall("^ok", output, re.M)
+            self.assertEqual((status, len(lines), output.count("# SKIP")), (0, 30, skipped), output)
+
+    def test_wrong_usage(self):
+        for arguments in ([], ["/nonexistent"], ["--unknown", ROOT], ["--only", "no such", ROOT / "box/appliance"],
+                          ["--limit", "0", ROOT / "box/appliance"]):
+            done = subprocess.run([*CHECK, *arguments], capture_output=True, text=True)
+            self.assertEqual((done.returncode, done.stdout, done.stderr.count("\n")), (2, "", 1))
+
+
+if __name__ == "__main__":
+    unittest.main()
