@@ -20,6 +20,7 @@ HOST_NAME = "etc/hostname"
 READ_FILES = (MODEL, INTERFACES, RESOLVER, "opt/kestrova/seq.site_conn", "opt/kestrova/config/nis.config")
 
 MOST_LINKS = 40  # that the kernel follows
+MOST_FOLDERS = 60  # one in the other
 MOST_TEXT_BYTES = 1 << 20
 MOST_COPIED_BYTES = 256 << 20
 
@@ -30,19 +31,26 @@ class Copy(Archive):
     def __init__(self):
         super().__init__()
         self.room = MOST_COPIED_BYTES
+        self.added = set()
         self.left_out = []
 
     def add_file(self, path, name):
         try:
-            self.room -= os.stat(path).st_size
-            if self.room < 0:
+            size = os.stat(path).st_size
+            if size > self.room:
                 raise OSError(0, "no room for it", path)
             super().add_file(path, name)
+            self.room -= size
         except OSError as fault:
             self.left_out.append(f"{path}: {fault.strerror}")
 
     def add_tree(self, path, name):
+        if name in self.added:
+            return
+        self.added.add(name)
         try:
+            if name.count("/") > MOST_FOLDERS:
+                raise OSError(0, "nested too deeply", path)
             super().add_tree(path, name)
         except OSError as fault:
             self.left_out.append(f"{path}: {fault.strerror}")
@@ -151,8 +159,9 @@ class Appliance:
     def copy_to(self, directory):
         """Copies what the box needs, and returns what has been left out."""
         copy = Copy()
-        for part in ("etc", "opt"):
-            if os.path.isdir(f"{self.root}/{part}"):
+        # What is needed most comes first, in case there is no room for everything.
+        for part in ("etc", "opt/kestrova", "opt"):
+            if os.path.isdir(f"{self.root}/{part}") and not os.path.islink(f"{self.root}/{part}"):
                 copy.add_tree(f"{self.root}/{part}", part)
         copy.unpack(directory)
         # The tools in the box are the host's, and look things up in these.
