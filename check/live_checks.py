@@ -48,7 +48,7 @@ class Trial:
     def call(self, *words):
         call = self.begin(*words)
         if not call.wait(self.limit):
-            raise TooLong(f"{' '.join(words)}: it has not returned within {self.limit} seconds")
+            raise GivenUp(f"{' '.join(words)}: it has not returned within {self.limit} seconds")
         return call
 
     def static_words(self, address=NEW, port=None, dns=()):
@@ -68,8 +68,8 @@ class Trial:
             os.kill(int(number.read()), signal.SIGKILL)
 
 
-class TooLong(Exception):
-    """The script has taken too long, so that nothing more can be tried."""
+class GivenUp(Exception):
+    """What is wrong, after which nothing more can be tried."""
 
 
 def shown(port):
@@ -154,24 +154,29 @@ def puts_back(trial):
         call = trial.call(*words)
         help_again()
         changed = [path for path, text in files().items() if text != before[path]]
+        # One that writes in place may well succeed.
         if call.status != "0" and changed:
             yield f"{what}: it has failed with status {call.status} and left {' '.join(changed)} changed"
         if call.status == "0":
             if "--dhcp" not in words and NEW not in text_of("/etc/network/interfaces"):
                 yield f"{what}: its status is 0, but nothing has been written"
-            return  # it has not failed, and the files are no longer those of the beginning
+        before = files()
 
 
-def meet_at_work(trial, walk=0):
-    """Waits until the script is at work, to which an operator may have to walk for some seconds."""
-    if not script.somebody_waits(walk + trial.limit):
-        raise Skip("it changes the port without ip and ifconfig, so that it cannot be met at work")
+def met_at_work(trial, words):
+    """Begins a change, and returns when the script is about to run its first command that changes a port."""
+    script.close_gate()
+    call = trial.begin(*words)
+    wait_until(lambda: script.somebody_waits() or call.shell.poll() is not None, trial.limit)
+    if script.somebody_waits():
+        return call
+    if not call.wait(0) or call.status != "0":
+        raise GivenUp(f"{' '.join(words)}: it has failed, or has not returned within {trial.limit} seconds")
+    raise Skip("the script changes ports without ip and ifconfig, so that it cannot be met at work")
 
 
 def one_at_a_time(trial):
-    script.close_gate()
-    first = trial.begin(*trial.static_words())
-    meet_at_work(trial)
+    first = met_at_work(trial, trial.static_words())
 
     def state():
         return files(), addresses_of(trial.other), second.shell.poll()
@@ -195,10 +200,13 @@ SET_NEW = "keys e d e e e e e u e d10\nhold enter 1\nrelease\n"
 
 
 def goes_on(ending, trial):
-    trial.set_static(OLD)
+    call = met_at_work(trial, trial.static_words(OLD))
+    script.open_gate()
+    call.wait(trial.limit)
     script.close_gate()
     operator = Operator(f"{to_page(OLD)}{SET_NEW}wait 3600\n")
-    meet_at_work(trial, STEP_LIMIT_S)
+    if not wait_until(script.somebody_waits, STEP_LIMIT_S):
+        raise GivenUp(f"the panel has not called it to set {NEW}")
     ending(operator)
     # With the service its /tmp goes.
     subprocess.run("rm -rf /tmp/* /tmp/.[!.]*", shell=True)
@@ -210,7 +218,7 @@ def goes_on(ending, trial):
         if NEW not in text_of("/etc/network/interfaces"):
             yield "/etc/network/interfaces does not have the new address"
 
-    wait_until(lambda: not list(faults()), SETTLE_S)
+    wait_until(lambda: not list(faults()), trial.limit)
     yield from faults()
 
 

@@ -22,7 +22,7 @@ def live(name, trial):
     try:
         for fault in check.function(live_checks.Trial(**trial)):
             faults.append(fault)
-    except live_checks.TooLong as fault:
+    except live_checks.GivenUp as fault:
         faults.append(str(fault))
     except live_checks.Skip as reason:
         return {"skip": str(reason)}

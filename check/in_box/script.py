@@ -6,12 +6,12 @@ import shlex
 import shutil
 import subprocess
 import threading
-import time
 
 from in_box.panel import AS_THE_SERVICE, SCRIPT, wait_until
 
 FILES = ("/etc/network/interfaces", "/etc/resolv.conf", "/etc/hostname")
 GATE = "/run/gate"
+# Stands in for a command that sets ports, at its place. Commands that only show something pass.
 HOLD = f"""#!/bin/sh
 case " $* " in
     *" add "* | *" del "* | *" delete "* | *" replace "* | *" change "* | *" flush "* | *" set "* | \\
@@ -23,7 +23,14 @@ esac
 exec {GATE}/NAME "$@"
 """
 REBOOT_ASKED = "/run/reboot-asked"
-REBOOT = f"#!/bin/sh\n: >{REBOOT_ASKED}\n"
+# Stands in for each command that can reboot: the first two may be links to the third.
+REBOOTERS = ("/usr/sbin/reboot", "/usr/sbin/shutdown", "/usr/bin/systemctl")
+REBOOT = f"""#!/bin/sh
+case "${{0##*/}} $*" in
+    reboot* | shutdown* | *" reboot"*) : >{REBOOT_ASKED} ;;
+    *) exit 1 ;; # there is no service manager
+esac
+"""
 HELD_S = 3  # for which somebody may still have the script's output open after its end
 
 
@@ -45,7 +52,6 @@ class Call:
     """The script at work, called as the program calls it for a port."""
 
     def __init__(self, words):
-        self.begin = time.monotonic()
         self.words = words
         self.shell = subprocess.Popen(
             [*AS_THE_SERVICE, "sh", "-c", f"{shlex.join([SCRIPT, *words])};echo $?"], start_new_session=True,
@@ -60,7 +66,7 @@ class Call:
 
     def wait(self, seconds):
         """Returns whether the script has returned in this time. After that, `status`, `printed` and
-        `holders` say how: whoever still had its output open a second later."""
+        `holders` say how: these are the commands that still have its output open after a while."""
         try:
             self.shell.wait(seconds)
         except subprocess.TimeoutExpired:
@@ -76,18 +82,20 @@ class Call:
 def close_gate():
     """From here on the first command that changes a port waits until the gate is opened, so that whoever
     runs it can be met at work. Those that follow pass."""
-    os.makedirs(GATE)
-    with open(f"{GATE}/closed", "w", encoding="ascii"):
-        pass
+    shutil.rmtree(f"{GATE}/held", ignore_errors=True)
+    os.makedirs(GATE, exist_ok=True)
+    write_command(f"{GATE}/closed", "")
     for name in ("ip", "ifconfig"):
+        if os.path.exists(f"{GATE}/{name}"):
+            continue
         command = os.path.realpath(shutil.which(name))
         shutil.copy(command, f"{GATE}/{name}")
         write_command(f"{GATE}/{name}-at-the-gate", HOLD.replace("NAME", name))
         subprocess.run(["mount", "--bind", f"{GATE}/{name}-at-the-gate", command], check=True)
 
 
-def somebody_waits(seconds):
-    return wait_until(lambda: os.path.exists(f"{GATE}/held"), seconds)
+def somebody_waits():
+    return os.path.exists(f"{GATE}/held")
 
 
 def open_gate():
@@ -130,11 +138,11 @@ def write_command(path, text):
 
 def watch_for_reboot():
     """From here on a reboot is only noted."""
-    for command in ("/run/box/inside/bin/reboot", "/run/reboot"):
-        write_command(command, REBOOT)
-    for command in ("/usr/sbin/reboot", "/usr/sbin/shutdown"):
+    write_command("/run/reboot", REBOOT)
+    for command in REBOOTERS:
+        write_command(f"/run/box/inside/bin/{os.path.basename(command)}", REBOOT)
         if os.path.exists(command):
-            subprocess.run(["mount", "--bind", "/run/reboot", command], check=False, stderr=subprocess.DEVNULL)
+            subprocess.run(["mount", "--bind", "/run/reboot", os.path.realpath(command)], check=True)
 
 
 def reboot_asked(seconds):
