@@ -205,7 +205,7 @@ def interfaces(subject):
         return
     for port, answer in subject.settings.items():
         if answer["meaning"] is None:
-            raise Skip("ifquery is missing: run apt-get install ifupdown")
+            raise Skip("there is no ifquery of ifupdown: run apt-get install ifupdown")
         read = without_servers(answer["panel"]["words"] or [])
         if read != answer["meaning"]:
             shown = " ".join(read) or answer["panel"]["shown"]

@@ -18,8 +18,8 @@ def is_ipv6(option, value):
 
 def meaning(port):
     """The port's IPv4 settings as words of the configuration script, [] if it has none, or None
-    without ifupdown."""
-    if not shutil.which("ifquery"):
+    without ifupdown. Others have an ifquery, too, which prints something else."""
+    if not shutil.which("ifquery") or not ask("ifquery", "--version").stdout.startswith("ifquery version"):
         return None
     # What is printed for a stanza comes in the order of the file, so that an IPv4 stanza's values are
     # the last that are not those of IPv6.
