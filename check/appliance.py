@@ -7,6 +7,7 @@ import os
 import re
 import stat
 import subprocess
+import tarfile
 
 from front.copies import Archive, check_host_name, open_regular
 from front.first_process import HOST_ETC
@@ -34,6 +35,13 @@ class Copy(Archive):
         self.added = set()
         self.left_out = []
 
+    def add(self, name, kind, *details, **more):
+        """Adds a name once. A link gives way to what has been added below its name."""
+        below = kind == tarfile.SYMTYPE and any(other.startswith(f"{name}/") for other in self.added)
+        if name not in self.added and not below:
+            self.added.add(name)
+            super().add(name, kind, *details, **more)
+
     def add_file(self, path, name):
         try:
             size = os.stat(path).st_size
@@ -47,7 +55,6 @@ class Copy(Archive):
     def add_tree(self, path, name):
         if name in self.added:
             return
-        self.added.add(name)
         try:
             if name.count("/") > MOST_FOLDERS:
                 raise OSError(0, "nested too deeply", path)
@@ -159,10 +166,14 @@ class Appliance:
     def copy_to(self, directory):
         """Copies what the box needs, and returns what has been left out."""
         copy = Copy()
-        # What is needed most comes first, in case there is no room for everything.
-        for part in ("etc", "opt/kestrova", "opt"):
-            if os.path.isdir(f"{self.root}/{part}") and not os.path.islink(f"{self.root}/{part}"):
-                copy.add_tree(f"{self.root}/{part}", part)
+        # What is needed most comes first, in case there is no room for everything. Where a link leads to
+        # something that the box does not have, that comes in its place.
+        for name in (*READ_FILES, HOST_NAME):
+            if not self.inner_place(name).startswith(("/etc/", "/opt/")) and os.path.isfile(self.place(name)):
+                copy.add_file(self.place(name), name)
+        for part in ("opt/kestrova", "etc", "opt"):
+            if os.path.isdir(self.place(part)):
+                copy.add_tree(self.place(part), part)
         copy.unpack(directory)
         # The tools in the box are the host's, and look things up in these.
         unwanted = list(HOST_ETC) if self.is_image else []

@@ -292,7 +292,7 @@ def keeps_others(trial):
     if len(read) > 1:
         other = without_servers(read[1]["words"] or [])
         if other != before[trial.other]:
-            yield f"of {trial.other} the panel reads {other or read[1]['shown']} instead of {before[trial.other]}"
+            yield f"{trial.other}: the panel reads {other or read[1]['shown']} instead of {before[trial.other]}"
 
 
 def replaces_files(trial):

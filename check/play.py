@@ -9,7 +9,7 @@ import tempfile
 
 HERE = os.path.dirname(os.path.realpath(__file__))
 BOX = os.path.join(os.path.dirname(HERE), "box", "kestrova-panel-box")
-KIT = "opt/kestrova/appliance-check"  # where the box finds these files and the two programs
+KIT = "opt/appliance-check"  # where the box finds these files and the two programs
 NO_BOX = 125
 MOST_SECONDS = 600  # after which a box is ended, whatever happens in it
 
@@ -75,7 +75,7 @@ class Stage:
 
     def ask(self, question, **details):
         """Has in_box/answer.py answer a question in a new box."""
-        said = self.run(f"/{KIT}/in_box/answer.py", question, json.dumps(details))
+        said = self.run("/usr/bin/python3", "-BIS", f"/{KIT}/in_box/answer.py", question, json.dumps(details))
         try:
             return json.loads(said.splitlines()[-1])
         except (IndexError, ValueError):

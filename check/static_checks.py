@@ -31,7 +31,7 @@ UNIT_FOLDERS = ("usr/lib/systemd/system", "lib/systemd/system", "usr/local/lib/s
 USES_LINE = re.compile(r"^(?!\s*[#;]).*(ttyS1\b|serial .*--unit=1\b).*", re.M)
 TOOLS = "stty ifconfig hostname awk sed grep egrep sort tr head cat env kill"
 TRY_SHELL = f"""echo "1\\n2"
-for tool in {TOOLS}; do command -v $tool >/tmp/none 2>&1 || echo "missing $tool"; done"""
+for tool in {TOOLS}; do [ -n "$(command -v $tool)" ] || echo "missing $tool"; done"""
 
 STANZA_WORD = r"(?:iface|auto|allow-|mapping|source|no-auto-down|no-scripts)"
 # What in a port's stanza makes the program read it otherwise than ifupdown, and how to say so.
@@ -179,7 +179,8 @@ def port_pages(subject):
         elif not label:
             yield f"the page of {name} has no label"
         elif same or re.fullmatch("eth[0-9]{2,}", name):
-            yield f"the page of {name} has the label {label}, which is that of {' '.join(same) or label.lower()}"
+            others = " ".join(same) or label.lower()
+            yield f"the page of {name} has the label {label}, which is that of {others}"
 
 
 def likely_cause(text, port):
@@ -249,7 +250,7 @@ def shell(subject):
     """The image's own shell, or, where there is no image, the one that the box has from this machine."""
     if subject.appliance.is_image:
         done = subprocess.run(
-            ["bwrap", "--ro-bind", subject.appliance.root, "/", "--tmpfs", "/tmp", "--unshare-all",
+            ["bwrap", "--ro-bind", subject.appliance.root, "/", "--unshare-all",
              "--clearenv", "--setenv", "PATH", IMAGE_PATH, "/bin/sh", "-c", TRY_SHELL],
             stdin=subprocess.DEVNULL, capture_output=True, text=True, errors="replace", timeout=IMAGE_LIMIT_S)
         if done.returncode != 0:
