@@ -11,7 +11,7 @@ HERE = os.path.dirname(os.path.realpath(__file__))
 BOX = os.path.join(os.path.dirname(HERE), "box", "kestrova-panel-box")
 KIT = "opt/appliance-check"  # where the box finds these files and the two programs
 NO_BOX = 125
-MOST_SECONDS = 600  # after which a box is ended, whatever happens in it
+MOST_SECONDS = 3600  # after which a box is ended, whatever happens in it
 
 
 class NoBox(Exception):
