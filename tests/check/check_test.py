@@ -31,24 +31,26 @@ printf '[Install]\nWantedBy=dev-ttyS1.device\n' >lib/systemd/system/kestrova-pan
 ln -s /usr/lib/systemd/system/kestrova-panel.service etc/systemd/system/dev-ttyS1.device.wants/
 echo net.ipv6.conf.all.disable_ipv6 = 1 >etc/sysctl.d/panel.conf
 """
-STANZAS = r"""
-names='eth0 eth1 eth2 eth3 eth4 eth5 eth6 eth7 eth8 eth9 eth10 eth11 eth12 eth13 eth14'
-for name in $names; do echo "$name -"; done >links
-mkdir etc/network/interfaces.d
-static() { printf "$2iface$3$1 inet static$4\n  address$5 10.0.${1#eth}.1$6\n  netmask 255.255.255.0\n$7"; }
-{ static eth0 '' ' ' '' '' ''; static eth1 '' ' ' '' '' '' '\n'
-printf 'iface eth2 inet6 auto\n\n'; static eth2 '' ' ' '' '' '' '\n'
-static eth3 ' ' ' ' '' '' '' '\n'; static eth4 '' '\t' '' '' '' '\n'
-printf 'iface eth5 inet dhcp # here\n\niface eth6 inet dhcp \n\n'
-static eth7 '' ' ' '' '' ' # here' '\n'; static eth9 '' ' ' '' '' ' ' '\n'
-static eth10 '' ' ' '' '' '/24' '\n'
-printf 'iface eth8 inet static\n\taddress\t10.0.0.1\n\tnetmask\t255.255.255.0\n\n'
-static eth11 '' ' ' '' '' '' '  hwaddress ether 02:00:00:00:00:01\n\n'
-static eth12 '' ' ' '' ' \\\n' '' '\n'; static eth13 '' ' ' '' '' '' ' \n'
-static lo '' ' ' '' '' '' '\n'
-echo 'source /etc/network/interfaces.d/*'; } >etc/network/interfaces
-static eth14 '' ' ' '' '' '' >etc/network/interfaces.d/more
-"""
+# Stanzas of the ports eth0, eth1 and so on, one directly behind the other, and what is wrong with each.
+GOOD = "iface PORT inet static\n  address ADDRESS\n  netmask 255.255.255.0\n\n"
+STANZAS = [
+    (GOOD.replace("\n\n", "\n"), "no empty line follows"),
+    (GOOD, None),
+    ("iface PORT inet6 auto\n\n" + GOOD, "inet6 stanza comes first"),
+    (" " + GOOD, "blank before iface"),
+    (GOOD.replace("iface ", "iface\t"), "a tab or more"),
+    ("iface PORT inet dhcp # here\n\n", "comment on the iface line"),
+    ("iface PORT inet dhcp \n\n", "blank at the end of the iface line"),
+    (GOOD.replace("ADDRESS", "ADDRESS # here"), "comment behind a value"),
+    (GOOD.replace("  address ", "\taddress\t"), "tab before a value"),
+    (GOOD.replace("ADDRESS", "ADDRESS "), "blank at the end of a line"),
+    (GOOD.replace("ADDRESS", "ADDRESS/24"), "prefix length"),
+    ("iface PORT inet static\n  address ADDRESS\n\n", "no netmask"),
+    (GOOD.replace("\n\n", "\n  hwaddress ether 02:00:00:00:00:01\n\n"), "another word"),
+    (GOOD.replace("ADDRESS", "\\\n  ADDRESS"), "goes on in the next"),
+    (GOOD.replace("\n\n", "\n \niface lo inet static\n  address 127.0.0.2\n\n"), "line of blanks"),
+    ("source /etc/network/interfaces.d/*\n", "source line"),
+]
 SERVERS = r"""{ printf 'nameserver\t9.9.9.9\nnameserver 2001:db8::1\n'
 printf 'nameserver 127.0.0.53\nnameserver 9.9.9.9 \n'
 seq -f 'nameserver 9.9.9.%g' 8; } >etc/resolv.conf"""
@@ -68,13 +70,8 @@ APPLIANCES = [
     ("for name in enp3s0 bridge2 eth10 eth9 eth0 eth0.7 evil0; do echo $name -; done >links", "label",
      ["enp3s0 has no page", "bridge2 has no label", "eth10 has the label E1", "eth9 has no label",
       "eth0 has the label E0", "eth0.7 has the label E0", "evil0 has no page"]),
-    (STANZAS, "settings", [
-        f"eth{number}: the panel .*{cause}" for number, cause in enumerate([
-            "no empty line follows", None, "inet6 stanza comes first", "blank before iface", "a tab or more",
-            "comment on the iface", "blank at the end of the iface", "comment behind a value",
-            "tab before a value", "blank at the end of a line", "prefix length", "another word", "goes on",
-            "line of blanks", "source line"])
-        if cause]),
+    ("cp ../stanzas etc/network/interfaces; cp -R ../interfaces.d etc/network; cp ../links .", "settings",
+     [f"eth{number}: the panel .*{cause}" for number, (_, cause) in enumerate(STANZAS) if cause]),
     ("rm etc/network/interfaces", "settings", ["is missing or empty"]),
     (SERVERS, "servers are", [r"nameserver\\t9.9.9.9' is not", "2001:db8::1 has an IPv6", "53 is a resolver",
                               "9.9.9.9 ' is not", "there are 12 servers", "the panel hands on"]),
@@ -135,6 +132,12 @@ class Checked(unittest.TestCase):
             return pool.map(lambda case: self.check(*case), cases)
 
     def test_faults_of_appliances(self):
+        stanzas = [stanza.replace("PORT", f"eth{number}").replace("ADDRESS", f"10.0.{number}.1")
+                   for number, (stanza, _) in enumerate(STANZAS)]
+        (self.work / "stanzas").write_text("".join(stanzas), encoding="utf-8")
+        (self.work / "links").write_text("".join(f"eth{number} -\n" for number in range(len(STANZAS))))
+        (self.work / "interfaces.d").mkdir()
+        (self.work / "interfaces.d/more").write_text(GOOD.replace("PORT", f"eth{len(STANZAS) - 1}"))
         cases = [(f"{number}", change, "--only", name) for number, (change, name, _) in enumerate(APPLIANCES)]
         for (_, name, said), (status, output) in zip(APPLIANCES, self.at_once(cases)):
             with self.subTest(name):
