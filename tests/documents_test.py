@@ -13,7 +13,7 @@ from pathlib import Path
 
 EMULATOR = sys.argv.pop(1)
 ROOT = Path(__file__).resolve().parents[1]
-TOOLS = (EMULATOR, ROOT / "box/kestrova-panel-box")
+TOOLS = (EMULATOR, ROOT / "box/kestrova-panel-box", ROOT / "check/kestrova-appliance-check")
 PAGES = [ROOT / "README.md", *sorted(ROOT.glob("docs/*.md"))]
 
 # A figure in a document, and the constant that it states.
@@ -67,7 +67,7 @@ def anchors_of(page):
 
 class Documents(unittest.TestCase):
     def test_help_and_the_manual_pages_list_the_same_options(self):
-        for tool in (*TOOLS, ROOT / "check/kestrova-appliance-check"):
+        for tool in TOOLS:
             page = text_of(f"packaging/man/{os.path.basename(tool)}.1")
             listed = page.partition("The options are:")[2].partition(".El")[0]
             described = {f"-{option}" for items in re.findall(r"^\.It (Fl .*)", listed, re.M)
