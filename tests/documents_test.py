@@ -18,8 +18,10 @@ PAGES = [ROOT / "README.md", *sorted(ROOT.glob("docs/*.md"))]
 
 # A figure in a document, and the constant that it states.
 FIGURES = [
-    ("packaging/man/panel-emulator.1", r"more\nthan (\d+) messages in a second",
+    ("packaging/man/panel-emulator.1", r"more\nthan (\d+) messages or",
      "emulator/web/WebSession.cpp", r"mostMessagesPerSecond = (\d+)"),
+    ("packaging/man/panel-emulator.1", r"or (\d+) requests in a second",
+     "emulator/web/WebSession.cpp", r"mostRequestsPerSecond = (\d+)"),
     ("packaging/man/panel-emulator.1", r"header of more than (\d+) bytes",
      "emulator/web/WebSession.cpp", r"mostHeaderBytes = (\d+)"),
     ("packaging/man/panel-emulator.1", r"At most (\d+) pages",

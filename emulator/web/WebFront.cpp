@@ -111,8 +111,10 @@ std::optional<WebService::Resource> WebFront::resource(std::string_view name) co
                                     [&](const WebFile &each) { return each.name == name; });
     if (file != webFiles.end())
         return Resource{file->type, std::string(file->text)};
-    if (name == "glass.json")
-        return Resource{"application/json", glassJson()};
+    if (name == "glass.json") {
+        static const std::string glass = glassJson();
+        return Resource{"application/json", glass};
+    }
     if (name == "journey")
         return Resource{"text/plain; charset=utf-8", journey()};
     return std::nullopt;

@@ -22,7 +22,8 @@ constexpr std::size_t mostHeaderBytes = 8192;
 constexpr std::size_t mostMessageBytes = 64;
 constexpr std::size_t mostBytesPerSecond = 16'384;
 constexpr int mostMessagesPerSecond = 100;
-constexpr int sendBufferBytes = 16'384; // what is older than that in states is of no use
+constexpr int mostRequestsPerSecond = 20; // opening the page takes four
+constexpr int sendBufferBytes = 16'384;   // what is older than that in states is of no use
 
 constexpr const char *contentPolicy =
     "default-src 'none'; img-src data:; script-src 'self'; style-src 'self'; connect-src 'self'; "
@@ -91,6 +92,8 @@ void WebSession::passOverRest() {
 
 void WebSession::answerRequest() {
     isAnswering = true;
+    if (isTooFast(mostRequestsPerSecond))
+        return close();
     const auto &request = parser->get();
     const std::string_view host = view(request[http::field::host]);
     const auto origin = request.find(http::field::origin);
@@ -111,8 +114,10 @@ void WebSession::answerRequest() {
 }
 
 void WebSession::answerFor(std::string_view name, bool isUpgrade) {
-    // A WebSocket does not tell a page why it was refused, but what the page asks for before does.
-    const bool isForPage = name.empty() || name == "glass.json" || name == "panel";
+    // A WebSocket does not tell a page why it was refused, but what the page asks for just before
+    // does. The document itself comes in any case: a page that is loaded anew may still count as
+    // the open one that it was.
+    const bool isForPage = name == "glass.json" || name == "panel";
     if (isForPage && !server.hasRoom())
         return refuse(http::status::service_unavailable, WebServer::tooManyPages());
     if (isUpgrade && name == "panel") {
@@ -165,18 +170,18 @@ void WebSession::awaitMessage() {
 void WebSession::takeMessage() {
     const auto bytes = received.cdata();
     const std::string_view message(static_cast<const char *>(bytes.data()), bytes.size());
-    if (!isLeaving && (isTooFast() || !service.take(page, message)))
+    if (!isLeaving && (isTooFast(mostMessagesPerSecond) || !service.take(page, message)))
         return close();
     awaitMessage();
 }
 
-bool WebSession::isTooFast() {
+bool WebSession::isTooFast(int mostPerSecond) {
     const TimePoint now = Clock::now();
     if (now - countedSince >= std::chrono::seconds(1)) {
         countedSince = now;
-        messages = 0;
+        counted = 0;
     }
-    return ++messages > mostMessagesPerSecond;
+    return ++counted > mostPerSecond;
 }
 
 void WebSession::show(Text state) {

@@ -62,7 +62,7 @@ class WebSession : public std::enable_shared_from_this<WebSession> {
     void openPage();
     void awaitMessage();
     void takeMessage();
-    [[nodiscard]] bool isTooFast();
+    [[nodiscard]] bool isTooFast(int mostPerSecond);
     void writeNext();
     void endWriting();
 
@@ -79,7 +79,7 @@ class WebSession : public std::enable_shared_from_this<WebSession> {
     Text next;    // to be written
     Text current; // being written
     TimePoint countedSince;
-    int messages = 0; // since then
+    int counted = 0; // requests or messages since then
     bool isAnswering = false;
     bool isOpening = false;
     bool hasOpened = false;

@@ -1,7 +1,7 @@
 #!/usr/bin/python3
 """Two emulators (the first argument) play the same journey for a minute: one alone, and one with as
-many pages as there may be, of which one is not read and one sends messages all the time. Compares what
-they traced."""
+many pages as there may be, of which one is not read and one sends messages all the time, beside
+connections that ask for as much as they can. Compares what they traced."""
 
 import contextlib
 import selectors
@@ -42,6 +42,16 @@ def send_until_closed(page):
             time.sleep(1 / 50)
 
 
+def ask_until(panel, is_over):
+    """Asks on a connection without waiting for answers, and on the next when that one is closed."""
+    request = f"GET {panel.path}page.js HTTP/1.1\r\nHost: {panel.host}\r\n\r\n".encode()
+    while not is_over.is_set():
+        with contextlib.suppress(OSError), panel.connect() as connection:
+            connection.sendall(request * 50)
+            while connection.recv(65536):
+                pass
+
+
 def read_until_closed(pages):
     with selectors.DefaultSelector() as selector:
         for page in pages:
@@ -68,11 +78,16 @@ class Timing(unittest.TestCase):
             for writer in writers:
                 writer.start()
             threading.Thread(target=read_until_closed, args=[crowd]).start()
+            is_over = threading.Event()
+            self.addCleanup(is_over.set)
+            for _ in range(16):
+                threading.Thread(target=ask_until, args=[panel, is_over]).start()
             wait_for(seen, 60, polls=POLLS // 2)
             # By now the one that does not read has been dropped, and the one that sends has not.
             self.assertEqual([writer.is_alive() for writer in writers], [False, True])
             self.assertLess(panel.memory(), memory + 2048)
             wait_for(seen, 60, ending="the journey was played to its end")
+            is_over.set()
             self.assertEqual((panel.process.wait(10), alone.wait(10)), (0, 0))
         marks = []
         for trace in traces:
