@@ -39,6 +39,12 @@ tcp::acceptor listening(Loop &loop, const tcp::endpoint &endpoint) {
     }
 }
 
+// Where it listens, by the plain address.
+tcp::endpoint place(const tcp::acceptor &acceptor) {
+    const tcp::endpoint endpoint = acceptor.local_endpoint();
+    return {plainAddress(endpoint.address()), endpoint.port()};
+}
+
 // The address of this machine from which it would send to far ones. Nothing is sent.
 boost::asio::ip::address ownAddress(Loop &loop) {
     using boost::asio::ip::udp;
@@ -64,15 +70,15 @@ WebServer::~WebServer() {
 }
 
 std::string WebServer::address(Use use) const {
-    tcp::endpoint endpoint = acceptor.local_endpoint();
+    tcp::endpoint endpoint = place(acceptor);
     if (endpoint.address().is_unspecified())
         endpoint.address(boost::asio::ip::address_v4::loopback());
     return addressAt(endpoint, use);
 }
 
 std::optional<std::string> WebServer::addressForOthers(Use use) const {
-    tcp::endpoint endpoint = acceptor.local_endpoint();
-    if (plainAddress(endpoint.address()).is_loopback())
+    tcp::endpoint endpoint = place(acceptor);
+    if (endpoint.address().is_loopback())
         return std::nullopt;
     if (endpoint.address().is_unspecified())
         endpoint.address(ownAddress(loop));
