@@ -124,10 +124,19 @@ void Emulator::startCommand() {
     setenv("PANEL_COMMAND_PID", std::to_string(command->pid()).c_str(), 1);
 }
 
-// Whoever asks is told by a display that is blank until the new program draws on it.
 void Emulator::startOver() {
     isStartingOver = true;
     command->end();
+}
+
+// The display is blank until the new program draws on it.
+void Emulator::beginAnew() {
+    isStartingOver = false;
+    line.clear();
+    display = Display();
+    keypad.switchOn();
+    webFront->beginAnew();
+    startCommand();
 }
 
 int Emulator::run() {
@@ -213,13 +222,10 @@ void Emulator::letOperatorsLook(TimePoint now) {
 
 void Emulator::noticeCommandsEnd() {
     const std::optional<int> status = command->status();
-    if (status && !result && isStartingOver && !command->isLeftRunning()) {
-        isStartingOver = false;
-        line.clear();
-        display = Display();
-        keypad.switchOn();
-        webFront->beginAnew();
-        return startCommand();
+    if (status && !result && isStartingOver) {
+        if (!command->isLeftRunning())
+            return beginAnew();
+        finish(EXIT_FAILURE, "the program could not be ended to start over");
     }
     if (status && !result) {
         if (journeyOperator)

@@ -36,6 +36,7 @@ class Emulator {
   private:
     void startCommand();
     void startOver();
+    void beginAnew();
     void handleSignal(int number);
     void turn();
     [[nodiscard]] TimePoint nextTurn(TimePoint now) const;

@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <cmath>
 #include <nlohmann/json.hpp>
+#include <utility>
 
 namespace emulator {
 
@@ -91,7 +92,8 @@ std::optional<TimePoint> WebFront::wakeAt() const {
 }
 
 void WebFront::beginAnew() {
-    letGo();
+    isStartingOver = false;
+    load = LineLoad(Clock::now());
     appliances++;
     recording.str("");
     recorded = 0;
@@ -137,6 +139,7 @@ std::string WebFront::state() const {
         {"appliance", appliances},
         {"recorded", static_cast<std::streamoff>(recorded)},
         {"isFull", isFull},
+        {"isStartingOver", isStartingOver},
     };
     if (!ending.empty()) {
         state["ending"] = withoutOtherBytes(ending);
@@ -158,8 +161,10 @@ bool WebFront::take(const Page &page, std::string_view message) {
     if (page.use == Use::watch)
         return false;
     if (message == startOverWord) {
-        if (startOver && ending.empty())
+        if (startOver && ending.empty() && !std::exchange(isStartingOver, true)) {
+            letGo();
             startOver();
+        }
         return startOver != nullptr;
     }
     if (message == releaseWord || message == holdWord) {
@@ -176,7 +181,7 @@ bool WebFront::take(const Page &page, std::string_view message) {
     });
     if (key == keys.end())
         return false;
-    if (use == Use::operate && ending.empty())
+    if (use == Use::operate && ending.empty() && !isStartingOver)
         press(key->key, page);
     return true;
 }

@@ -59,6 +59,7 @@ class WebFront : public Operator, private WebService {
     TimePoint holdUntil = TimePoint::max(); // unless that page says that it still holds the key
     LineLoad load;
     unsigned appliances = 1;      // so far
+    bool isStartingOver = false;  // until the next one is there
     std::ostringstream recording; // of all that has been done at the present one
     std::optional<Recorder> recorder;
     bool isFull = false;         // of as much as may be recorded

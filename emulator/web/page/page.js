@@ -1,6 +1,8 @@
 // The panel on a page: draws the states that the emulator sends, and tells it of keys.
 
 const element = id => document.getElementById(id);
+// What has not changed stays as it is, and is not read out again.
+const put = (id, text) => element(id).textContent !== text && (element(id).textContent = text);
 const keyButtons = [...document.querySelectorAll("[data-key]")];
 const keyNames = { up: "Up", down: "Down", enter: "Enter", escape: "Escape" };
 const panelKeys = { ArrowUp: "up", ArrowDown: "down", Enter: "enter", Escape: "escape" };
@@ -94,18 +96,13 @@ function sayRows() {
     return;
   sayTimer = setTimeout(() => {
     changedSince = null;
-    [...state.rows, describeCursor(state)].forEach((text, row) => {
-      const line = element("text").children[row];
-      if (line.textContent !== text)
-        line.textContent = text;
-    });
+    [...state.rows, describeCursor(state)].forEach((text, row) => put(`line${row}`, text));
   }, Math.min(250, Math.max(0, changedSince + 1000 - performance.now())));
 }
 
 function tell(notice, trouble = "") {
-  for (const [id, text] of [["notice", notice], ["trouble", trouble]])
-    if (element(id).textContent !== text)
-      element(id).textContent = text;
+  put("notice", notice);
+  put("trouble", trouble);
   document.body.classList.toggle("lost", trouble !== "");
 }
 
@@ -117,8 +114,10 @@ function show(newest) {
   state = newest;
   if ("page" in newest)
     own = newest;
-  if (before?.appliance !== state.appliance)
+  if (before?.appliance !== state.appliance) {
     opened = before ? 0 : state.recorded;
+    put("saved", "");
+  }
   const sight = ({ rows, cursor }) => [...rows, cursor?.[0], cursor?.[1]];
   const hasChanged = !before || sight(state).some((part, k) => part !== sight(before)[k]);
   if (hasChanged)
@@ -128,27 +127,28 @@ function show(newest) {
   for (const button of keyButtons) {
     button.classList.toggle("down", button.dataset.key === state.down);
     button.classList.toggle("others", isOthers(state));
-    button.disabled = Boolean(own.watch || state.ending);
+    button.disabled = !isLive();
   }
-  element("held").textContent = describeKey(state);
-  element("load").textContent = `${state.load} %`;
-  element("bytes").textContent = state.bytes;
-  element("program").textContent = state.ending ?? state.program;
+  put("held", describeKey(state));
+  put("load", `${state.load} %`);
+  put("bytes", state.bytes);
+  put("program", state.ending ?? state.program);
   element("save").disabled = false;
-  element("anew").disabled = !own.canStartOver || Boolean(state.ending);
-  if (state.isFull)
-    element("saved").textContent = "The recording is full: nothing more is added to it.";
+  element("anew").disabled = !own.canStartOver || !isLive();
+  put("recording", state.isFull ? "The recording is full: nothing more is added to it." : "");
   if (state.ending)
     tell("", `The emulator has ended: ${state.ending}.`);
   else
-    tell(watching[own.watch] ?? "Connected.");
+    tell(state.isStartingOver ? "A fresh appliance is started …" : watching[own.watch] ?? "Connected.");
 }
 
 // The keys: one is down at a time, by the keyboard key or the pointer that pressed it last.
 
 let presser = null;
 
-const send = text => socket?.readyState === WebSocket.OPEN && socket.send(text);
+const isOpen = () => socket?.readyState === WebSocket.OPEN;
+const isLive = () => isOpen() && Boolean(state) && !own.watch && !state.ending && !state.isStartingOver;
+const send = text => isOpen() && socket.send(text);
 
 function press(key, by) {
   presser = by;
@@ -176,10 +176,10 @@ function keyOf(event) {
 
 addEventListener("keydown", event => {
   const key = keyOf(event);
-  if (!key)
+  if (!key || !isLive())
     return;
   event.preventDefault();
-  if (!event.repeat && !own.watch)
+  if (!event.repeat)
     press(key, event.code);
 });
 addEventListener("keyup", event => {
@@ -214,18 +214,21 @@ element("save").addEventListener("click", async () => {
   try {
     const text = state.journey ?? await (await fetched("journey")).text();
     const head = text.split("\n", 2).join("\n") + "\n";
+    if (!text)
+      return put("saved", "Nothing has been recorded yet.");
     const bytes = new TextEncoder().encode(text);  // of which `opened` is a number
     const link = document.createElement("a");
-    link.href = URL.createObjectURL(new Blob([head, bytes.slice(opened)], { type: "text/plain" }));
+    const added = bytes.slice(Math.max(opened, head.length));
+    link.href = URL.createObjectURL(new Blob([head, added], { type: "text/plain" }));
     link.download = "panel.journey";
     link.click();
     setTimeout(() => URL.revokeObjectURL(link.href), 1000);
     const mayBeginInMenu = /^(tap|hold) enter/m.test(new TextDecoder().decode(bytes.slice(0, opened)));
-    element("saved").textContent = !mayBeginInMenu ? "Saved." :
+    put("saved", !mayBeginInMenu ? "Saved." :
       "Saved. Enter was pressed before this page was opened: if it was opened in a menu, the journey " +
-      "cannot be played. Reload the page while a status page is shown, and do it once more.";
+      "cannot be played. Reload the page while a status page is shown, and do it once more.");
   } catch {
-    element("saved").textContent = "The journey could not be fetched: nothing has been saved.";
+    put("saved", "The journey could not be fetched: nothing has been saved.");
   }
 });
 
@@ -238,7 +241,8 @@ element("full").hidden = !document.fullscreenEnabled;
 element("full").addEventListener("click", async () => {
   if (document.fullscreenElement)
     return document.exitFullscreen();
-  await document.documentElement.requestFullscreen();
+  await document.documentElement.requestFullscreen().catch(
+    () => put("saved", "The browser does not allow a full screen here."));
   // Otherwise Escape would only end the full screen.
   navigator.keyboard?.lock?.(["Escape"]);
 });
@@ -274,8 +278,7 @@ function connectAgain({ cause } = {}) {
     button.classList.remove("down");
     button.disabled = true;
   }
-  for (const field of ["held", "load", "bytes", "program"])
-    element(field).textContent = "";
+  ["held", "load", "bytes", "program"].forEach(field => put(field, ""));
   tell("", cause || "The connection is lost. Trying again … If the emulator was ended, start it anew and " +
        "open the address that it prints.");
   setTimeout(connect, retryTime);
@@ -301,8 +304,7 @@ async function connect() {
 // Another zoom, or another screen.
 function awaitResolution() {
   fitGlass();
-  matchMedia(`(resolution: ${devicePixelRatio}dppx)`)
-    .addEventListener("change", awaitResolution, { once: true });
+  matchMedia(`(resolution: ${devicePixelRatio}dppx)`).addEventListener("change", awaitResolution, { once: true });
 }
 
 new ResizeObserver(fitGlass).observe(element("glass"));
