@@ -19,7 +19,8 @@ expect "faults of five manual pages" "5 " "$(find "$prefix/share/man" -type f | 
 cd "$prefix/share/doc/kestrova-panel" || exit 1
 expect "links of four guides to what is not installed" "4 " "$(find . -name '*.md' | wc -l) $(
     grep -oh ']([^)#]*' ./*.md | cut -c 3- | xargs -I '{}' sh -c '[ -e "{}" ] || echo "{}"')"
-expect "versions of the tools" 1 "$(for tool in panel-emulator kestrova-panel-box; do
+expect "versions of the tools" 1 "$(for tool in panel-emulator \
+    kestrova-panel-box kestrova-appliance-check; do
     "$prefix/bin/$tool" --version | cut -d " " -f 2; done | uniq | wc -l)"
 
 cd "$prefix/share/kestrova-panel" || exit 1
