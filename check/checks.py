@@ -10,5 +10,8 @@ class Check(NamedTuple):
     advice: str
 
 
+OWN_ADVICE = "\n-> "  # stands in a fault before what is to be done, if that is not the check's advice
+
+
 class Skip(Exception):
     """The reason why a check says nothing about this appliance."""

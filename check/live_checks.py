@@ -10,7 +10,7 @@ import shutil
 import signal
 import subprocess
 
-from checks import Check, Skip
+from checks import OWN_ADVICE, Check, Skip
 from in_box import script
 from in_box.meaning import meaning
 from in_box.panel import STEP_LIMIT_S, Operator, settings, to_page, wait_until, without_servers
@@ -40,6 +40,7 @@ class Trial:
         self.port = port
         self.other = other
         self.limit = limit
+        self.statuses = set()
         script.watch_for_reboot()
 
     def begin(self, *words):
@@ -49,6 +50,7 @@ class Trial:
         call = self.begin(*words)
         if not call.wait(self.limit):
             raise GivenUp(f"{' '.join(words)}: it has not returned within {self.limit} seconds")
+        self.statuses.add(call.status)
         return call
 
     def static_words(self, address=NEW, port=None, dns=()):
@@ -70,6 +72,19 @@ class Trial:
 
 class GivenUp(Exception):
     """What is wrong, after which nothing more can be tried."""
+
+
+def faults_of(check, trial):
+    """The faults that a check finds. Those of a script that has refused all changes say nothing."""
+    faults = []
+    try:
+        for fault in check.function(trial):
+            faults.append(fault)
+    except GivenUp as fault:
+        faults.append(f"{fault}{OWN_ADVICE}mend this first: the rest of this check has not been made")
+    if not faults and trial.statuses and "0" not in trial.statuses:
+        raise Skip("the script has made no change")
+    return faults
 
 
 def shown(port):
@@ -100,7 +115,7 @@ def holds_nothing(trial):
 def sets_address(trial):
     call = trial.set_static()
     if call.status != "0":
-        yield f"its status is {call.status}"
+        yield call.outcome
     wait_until(lambda: not list(static_faults(trial)), SETTLE_S)
     yield from static_faults(trial)
 
@@ -120,13 +135,29 @@ def dhcp_faults(trial):
 def takes_lease(trial):
     call = trial.call(*trial.dhcp_words())
     if call.status != "0":
-        yield f"its status is {call.status}"
-    if f"{LEASE}/24" not in addresses_of(trial.port):
-        yield f"{trial.port} has {shown(trial.port)} instead of the lease {LEASE}/24"
+        yield call.outcome
+    before = shown(trial.port)
+
+    def has_lease():
+        return f"{LEASE}/24" in addresses_of(trial.port)
+
+    if not has_lease() and wait_until(has_lease, SETTLE_S):
+        yield f"when it returned, {trial.port} had {before}, and the lease only came later: wait for it"
+    elif not has_lease():
+        yield f"{trial.port} has {before} instead of the lease {LEASE}/24"
     yield from dhcp_faults(trial)
 
 
+def ends_client(trial):
+    trial.call(*trial.dhcp_words())
+    trial.set_static()
+    if not wait_until(lambda: not script.clients_of(trial.port), SETTLE_S):
+        clients = "; ".join(script.clients_of(trial.port))
+        yield f"{trial.port} is static, and this still renews its lease: {clients}"
+
+
 def gives_up_without_lease(trial):
+    trial.set_static()
     trial.stop_server()
     call = trial.call(*trial.dhcp_words())
     if call.status == "0":
@@ -136,8 +167,10 @@ def gives_up_without_lease(trial):
 def takes_servers(trial):
     for words, wanted in ((trial.static_words(dns=SERVERS), SERVERS), (trial.static_words(), []),
                           (trial.dhcp_words(), [DHCP_SERVER]), (trial.dhcp_words(dns=SERVERS), SERVERS)):
-        trial.call(*words)
-        if servers() != wanted:
+        call = trial.call(*words)
+        if call.status != "0":
+            yield f"{' '.join(words)}: {call.outcome}"
+        elif servers() != wanted:
             yield f"after {' '.join(words)} /etc/resolv.conf names {servers()} instead of {wanted}"
 
 
@@ -145,6 +178,7 @@ def puts_back(trial):
     def unwritable(folder):
         return (lambda: os.chmod(folder, 0o555)), (lambda: os.chmod(folder, 0o755))
 
+    trial.set_static(OLD)
     before = files()
     for what, (hinder, help_again), words in (
             ("/etc/network cannot be written", unwritable("/etc/network"), trial.static_words(dns=SERVERS)),
@@ -170,8 +204,10 @@ def met_at_work(trial, words):
     wait_until(lambda: script.somebody_waits() or call.shell.poll() is not None, trial.limit)
     if script.somebody_waits():
         return call
-    if not call.wait(0) or call.status != "0":
-        raise GivenUp(f"{' '.join(words)}: it has failed, or has not returned within {trial.limit} seconds")
+    if not call.wait(0):
+        raise GivenUp(f"{' '.join(words)}: it has not returned within {trial.limit} seconds")
+    if call.status != "0":
+        raise GivenUp(f"{' '.join(words)}: {call.outcome}")
     raise Skip("the script changes ports without ip and ifconfig, so that it cannot be met at work")
 
 
@@ -238,6 +274,7 @@ def unplug(operator):
 
 
 def refuses(trial):
+    trial.set_static(OLD)
     static = trial.static_words
     refused = [
         [], ["nonsense"], ["iface", "--name", trial.port], ["iface", "--dhcp"], ["hostname"],
@@ -277,7 +314,7 @@ def keeps_others(trial):
     words = trial.static_words(dns=SERVERS)
     call = trial.call(*words)
     if call.status != "0":
-        yield f"its status is {call.status} for a file without empty lines"
+        yield f"for a file without empty lines, {call.outcome}"
     for name, settings_before in before.items():
         if meaning(name) != settings_before:
             yield f"{name} has lost its settings: they were {settings_before}, and are {meaning(name)}"
@@ -292,15 +329,19 @@ def keeps_others(trial):
     if len(read) > 1:
         other = without_servers(read[1]["words"] or [])
         if other != before[trial.other]:
-            yield f"{trial.other}: the panel reads {other or read[1]['shown']} instead of {before[trial.other]}"
+            shown_instead = other or read[1]["shown"]
+            yield f"{trial.other}: the panel reads {shown_instead} instead of {before[trial.other]}"
 
 
 def replaces_files(trial):
-    trial.set_static(OLD, dns=SERVERS)
+    first = trial.set_static(OLD, dns=SERVERS)
     held = {path: open(path, encoding="utf-8", errors="surrogateescape") for path in
             ("/etc/network/interfaces", "/etc/resolv.conf")}
     before = files()
-    trial.set_static(NEW, dns=SERVERS[:1])
+    os.chmod("/tmp", 0o555)
+    call = trial.set_static(NEW, dns=SERVERS[:1])
+    if call.status != first.status:
+        yield f"without /tmp, from which a file could not be renamed to its place, {call.outcome}"
     for path, file in held.items():
         if text_of(path) != before[path] and file.read() != before[path]:
             yield f"{path} is written in place: the panel may read a part of it"
@@ -313,7 +354,8 @@ def page_shows(trial):
         f'{to_page(OLD)}{limit}{SET_NEW}expect * "{NEW}"\n'
         f'keys e u e\nhold enter 1\nrelease\nexpect * "{LEASE}"\n').finish()
     if not succeeded:
-        yield said.strip()
+        yield f"{trial.port} was to have {NEW} and then the lease {LEASE}, which the panel does not show:\n" \
+            + said.strip()
 
 
 def reboots(trial):
@@ -335,6 +377,8 @@ CHECKS = [
     Check("the script returns when the change has been made", returns_when_made,
           "wait until the port has its address"),
     Check("the script takes a lease", takes_lease, "start a DHCP client, and write the port's stanza"),
+    Check("the script ends the DHCP client of a port that becomes static", ends_client,
+          "end the port's DHCP client before anything is set: it would bring the lease back"),
     Check("the script gives up when no DHCP server answers", gives_up_without_lease,
           "give the DHCP client an end, such as udhcpc -n"),
     Check("the script takes the servers as the complete list", takes_servers,
@@ -356,7 +400,8 @@ CHECKS = [
           "replace only the port's own stanza, even without empty lines, and write one after each stanza"),
     Check("the script replaces files in one step", replaces_files,
           "write a new file beside the old one, and rename it"),
-    Check("the panel shows the new address", page_shows, "try the script at the panel (panel-emulator(1))"),
+    Check("the panel shows the new address", page_shows,
+          "compare this with what kestrova-panel shows on panel-emulator(1) with this script"),
     Check("the script changes the host name and reboots", reboots,
           "write /etc/hostname, and call reboot, shutdown or systemctl reboot"),
 ]

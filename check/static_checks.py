@@ -131,6 +131,8 @@ def script(subject):
     elif interpreter and not (appliance.exists(interpreter[1][1:]) if appliance.is_image
                               else os.path.exists(interpreter[1])):
         yield f"its interpreter {interpreter[1]!r} does not exist"
+    elif first.endswith("\r"):
+        yield "its first line ends with a carriage return"
 
 
 def ordinary_files(subject):
@@ -272,10 +274,19 @@ def image_only(subject):
 def ipv6(subject):
     image_only(subject)
     off = re.compile(r"^\s*-?net[./]ipv6[./]conf[./](all|default)[./]disable_ipv6\s*=\s*1|ipv6\.disable=1|"
-                     r"addrgenmode\s+none|^\s*LinkLocalAddressing\s*=\s*(no|ipv4)", re.M)
-    files = subject.appliance.files_below("etc", "usr/lib/sysctl.d", *BOOT_FILES)
-    if not any(off.search(subject.appliance.text(file)) for file in files):
+                     r"addrgenmode\s+none", re.M)
+    texts = {file: subject.appliance.text(file)
+             for file in subject.appliance.files_below("etc", "usr/lib/sysctl.d", *BOOT_FILES)}
+    if any(map(off.search, texts.values())):
+        return
+    networks = {file: re.search(r"^\s*LinkLocalAddressing\s*=\s*(no|ipv4)", text, re.M)
+                for file, text in texts.items() if file.endswith(".network")}
+    if not any(networks.values()):
         yield "nothing switches IPv6 off: a port without an IPv4 address would show one that begins with fe80"
+        return
+    for file, is_off in networks.items():
+        if not is_off:
+            yield f"/{file} leaves IPv6 on: write LinkLocalAddressing=no there, too"
 
 
 def serial_line(subject):

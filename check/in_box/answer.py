@@ -18,15 +18,10 @@ from in_box.panel import pages, settings
 def live(name, trial):
     """The faults that a live check finds, or why it has to be skipped."""
     check = next(check for check in live_checks.CHECKS if check.name == name)
-    faults = []
     try:
-        for fault in check.function(live_checks.Trial(**trial)):
-            faults.append(fault)
-    except live_checks.GivenUp as fault:
-        faults.append(str(fault))
+        return {"faults": live_checks.faults_of(check, live_checks.Trial(**trial))}
     except live_checks.Skip as reason:
         return {"skip": str(reason)}
-    return {"faults": faults}
 
 
 QUESTIONS = {

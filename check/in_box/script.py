@@ -6,6 +6,7 @@ import shlex
 import shutil
 import subprocess
 import threading
+import time
 
 from in_box.panel import AS_THE_SERVICE, SCRIPT, wait_until
 
@@ -31,18 +32,45 @@ case "${{0##*/}} $*" in
     *) exit 1 ;; # there is no service manager
 esac
 """
+COMPLAINTS = "/run/standard-error"  # what the script has written to standard error
+LOGS = ("/opt/kestrova", "/var/log", "/run")
+STATUS = "status "  # which the shell prints behind all that the script does
+# By which a port gets a lease, with the port's name among their words.
+CLIENTS = r"(^|/| )(dhclient|udhcpc|dhcpcd)[: ].*\b{port}\b"
 HELD_S = 3  # for which somebody may still have the script's output open after its end
+
+
+def commands():
+    """The numbers of the processes in the box, and their commands."""
+    for process in filter(str.isdigit, os.listdir("/proc")):
+        words = text_of(f"/proc/{process}/cmdline").replace("\0", " ").strip()
+        if words:
+            yield process, words
+
+
+def clients_of(port):
+    """The DHCP clients of this port."""
+    return [words for _, words in commands() if re.search(CLIENTS.format(port=port), words)]
+
+
+def last_words(since):
+    """The last line that the script has written since then to standard error or to a log, if any."""
+    logs = (os.path.join(folder, name) for top in LOGS for folder, _, names in os.walk(top)
+            for name in names if name.endswith(".log"))
+    for place in (COMPLAINTS, *logs):
+        if os.path.isfile(place) and os.stat(place).st_mtime >= since and text_of(place).strip():
+            return f"; the last line in {place} is: {text_of(place).strip().splitlines()[-1]}"
+    return ""
 
 
 def holders_of(pipe):
     """The commands that have this end of a pipe open."""
     holders = []
-    for process in filter(str.isdigit, os.listdir("/proc")):
+    for process, words in commands():
         try:
             folder = f"/proc/{process}/fd"
             if pipe in (os.readlink(f"{folder}/{number}") for number in os.listdir(folder)):
-                with open(f"/proc/{process}/cmdline", errors="replace") as words:
-                    holders.append(words.read().replace("\0", " ").strip())
+                holders.append(words)
         except OSError:
             continue
     return [holder for holder in holders if "answer.py" not in holder]
@@ -53,9 +81,11 @@ class Call:
 
     def __init__(self, words):
         self.words = words
-        self.shell = subprocess.Popen(
-            [*AS_THE_SERVICE, "sh", "-c", f"{shlex.join([SCRIPT, *words])};echo $?"], start_new_session=True,
-            stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, stderr=subprocess.DEVNULL)
+        self.begun = time.time()
+        with open(COMPLAINTS, "w") as complaints:
+            self.shell = subprocess.Popen(
+                [*AS_THE_SERVICE, "sh", "-c", f"{shlex.join([SCRIPT, *words])};printf '{STATUS}%s' $?"],
+                start_new_session=True, stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, stderr=complaints)
         self.said = []
         self.reader = threading.Thread(target=self.read, daemon=True)
         self.reader.start()
@@ -66,7 +96,8 @@ class Call:
 
     def wait(self, seconds):
         """Returns whether the script has returned in this time. After that, `status`, `printed` and
-        `holders` say how: these are the commands that still have its output open after a while."""
+        `holders` say how: these are the commands that still have its output open after a while.
+        `outcome` is the status with all that tells why."""
         try:
             self.shell.wait(seconds)
         except subprocess.TimeoutExpired:
@@ -74,8 +105,9 @@ class Call:
         self.reader.join(HELD_S)
         self.holders = holders_of(os.readlink(f"/proc/self/fd/{self.shell.stdout.fileno()}")) \
             if self.reader.is_alive() else []
-        lines = b"".join(self.said).decode(errors="replace")
-        self.printed, self.status = re.fullmatch(r"(.*?)([0-9]*)\n?", lines, re.S).groups()
+        self.printed, _, self.status = b"".join(self.said).decode(errors="replace").rpartition(STATUS)
+        self.outcome = f"its status is {self.status} after {time.time() - self.begun:.0f} seconds" + \
+            last_words(self.begun)
         return True
 
 
