@@ -94,9 +94,11 @@ class Documents(unittest.TestCase):
         self.assertGreater(len(listed), 20)
         self.assertEqual(words(re.findall(r"^  (\S.*?)(?:  |$)", steps, re.M)), words(listed))
 
-    def test_the_journey_of_the_operators_guide_is_one_that_is_tested(self):
-        journey = re.search("\n```\n(expect .*?)```", text_of("docs/operator-guide.md"), re.S)[1]
-        self.assertIn(f"\n{journey}", text_of("tests/journeys/documents.journey"))
+    def test_the_journeys_of_the_documents_are_tested(self):
+        for path, pattern in (("docs/operator-guide.md", "\n```\n(expect .*?)```"),
+                              ("packaging/man/kestrova-journey.5", r"\.Sh EXAMPLES\n\.Bd -literal\n(.*?)\.Ed")):
+            journey = re.search(pattern, text_of(path), re.S)[1]
+            self.assertIn(f"\n{journey}", text_of("tests/journeys/documents.journey"))
 
     def test_the_operators_guide_has_the_text_of_every_screen(self):
         guide = text_of("docs/operator-guide.md")
