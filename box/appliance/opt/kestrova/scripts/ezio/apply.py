@@ -1,8 +1,8 @@
 #!/usr/bin/python3
 """Applies what an operator has set at the front panel.
 
-The integrator's guide (docs/integration.md) describes how the panel program calls a configuration
-script and what such a script has to do.
+The integrator's guide describes how the panel program calls a configuration script and what such a
+script has to do.
 
 The exit status of this one is 0 if everything has been applied, 1 if something has failed, and 2 if
 the arguments were refused. After a failure or a refusal the configuration files are as they were
