@@ -13,7 +13,7 @@ interfaces=/etc/network/interfaces
 resolver=/etc/resolv.conf
 hostname=/etc/hostname
 saved='' port='' dhcp='' address='' netmask='' gateway='' servers='' name=''
-octet='(25[0-5]|2[0-4][0-9]|1?[0-9]?[0-9])'
+octet='(25[0-5]|2[0-4][0-9]|1[0-9][0-9]|[1-9]?[0-9])'
 
 refuse() {
     echo "refused: $*"
@@ -31,11 +31,13 @@ while [ $# -gt 0 ]; do
         --hostname) name=$2 ;;
         --ipaddress | --netmask | --gateway | --dns)
             echo "$2" | grep -Eqx "$octet(\.$octet){3}" || refuse "$1 $2"
-            case $1 in
-                --ipaddress) address=$2 ;;
-                --netmask) netmask=$2 ;;
-                --gateway) gateway=$2 ;;
-                --dns) servers="$servers $2" ;;
+            case $1=$2 in
+                --dns=*) servers="$servers $2" ;;
+                --netmask=[1-9]*) netmask=$2 ;;
+                # What is left of these is no address of a host.
+                *=0.* | *=127.* | *=22[4-9].* | *=2[345]?.*) refuse "$1 $2" ;;
+                --ipaddress=*) address=$2 ;;
+                --gateway=*) gateway=$2 ;;
             esac ;;
         *) refuse "$1" ;;
     esac
@@ -46,10 +48,12 @@ done
 begin() {
     saved=$*
     trap put_back EXIT
+    trap 'exit 1' INT TERM
     for file in $saved; do [ ! -e "$file" ] || cp -p "$file" "$file.before"; done
 }
 put_back() {
     for file in $saved; do
+        rm -f "$file.new"
         [ ! -e "$file.before" ] || mv "$file.before" "$file"
     done
     [ -z "$port" ] || { ip -4 addr flush dev "$port" && ifup --force "$port"; }
@@ -61,18 +65,18 @@ finish() {
 
 case $action in
     hostname)
-        [ ${#name} -gt 0 ] || refuse "no name"
+        case $name in '' | .* | *. | *..*) refuse "the name" ;; esac
         [ ${#name} -le 64 ] || refuse "the name is too long"
         begin $hostname
         echo "$name" >$hostname.new
         mv $hostname.new $hostname
+        trap '' INT TERM # which come with the reboot
         systemctl reboot
         finish
         exit ;;
     iface)
         case $port in eth*) ip link show dev "$port" ;; *) refuse "the port" ;; esac
-        [ -n "$dhcp" ] || [ -n "$address" ] || refuse "no address"
-        [ -n "$dhcp" ] || [ -n "$netmask" ] || refuse "no netmask" ;;
+        case $dhcp:$address:$netmask in yes:: | :?*:?*) ;; *) refuse "neither DHCP nor an address" ;; esac ;;
     *) refuse "the action" ;;
 esac
 
