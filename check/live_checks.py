@@ -12,20 +12,39 @@ import subprocess
 
 from checks import OWN_ADVICE, Check, Skip
 from in_box import script
-from in_box.meaning import meaning
+from in_box.meaning import brought_up_at_boot, meaning, settings_of
 from in_box.panel import STEP_LIMIT_S, Operator, settings, to_page, wait_until, without_servers
 from in_box.script import Call, addresses_of, files, gateways_of, servers, text_of
+from play import BOX
 
-# Of networks for measurements, which an appliance has no use for.
-OLD, NEW, GATEWAY, MASK = "198.18.5.10", "198.18.5.11", "198.18.5.254", "255.255.255.0"
-OTHER_NEW = "198.18.6.77"
-DHCP_SERVER, LEASE = "198.18.7.1", "198.18.7.100"
+# Of networks for measurements, which an appliance has no use for. The netmask is one that a script which
+# passes over its argument would hardly take instead.
+OLD, NEW, GATEWAY, MASK, PREFIX = "198.18.5.10", "198.18.5.11", "198.18.5.254", "255.255.240.0", 20
+OTHER_NEW = "198.18.22.77"
+NEVER_SET, NEVER_SET_NEW = "eth7", "198.18.55.77"  # a port that few appliances have
+DHCP_SERVER, LEASE = "198.18.39.1", "198.18.39.100"
 SERVERS = ["198.18.5.1", "198.18.5.2"]
 
 SETTLE_S = 10  # for a change that is made after the script has returned
 PATIENCE_S = 4  # for which a second script has to be seen waiting
 TOUCHED = "/run/touched"
 INJECTED = f";touch {TOUCHED}"
+
+SOURCED, SOURCED_PORT = "/etc/network/sourced", "source-by-check"
+# What a script could lose, for a file that does not have all of this.
+PLANTED = f"""
+allow-hotplug added-by-check
+iface added-by-check inet static
+    address 198.18.64.1
+    netmask 255.255.255.0
+    mtu 1400
+    up true
+iface added-by-check inet6 static
+    address 2001:db8::1
+    netmask 64
+source {SOURCED}
+"""
+LEASE_SCRIPT = "etc/udhcpc/default.script"  # without which udhcpc does not set a port
 
 
 def dns_words(servers):
@@ -92,14 +111,15 @@ def shown(port):
 
 
 def static_faults(trial, address=NEW, gateway=GATEWAY):
-    if addresses_of(trial.port) != [f"{address}/24"]:
-        yield f"{trial.port} has {shown(trial.port)} instead of {address}/24"
+    if addresses_of(trial.port) != [f"{address}/{PREFIX}"]:
+        yield f"{trial.port} has {shown(trial.port)} instead of {address}/{PREFIX}"
     if gateways_of(trial.port) != [gateway]:
         yield f"the default route of {trial.port} leads to {gateways_of(trial.port)} instead of {gateway}"
 
 
 def prints_nothing(trial):
-    for words in (trial.static_words(), trial.static_words("none"), ["hostname", "--hostname", "new-name"]):
+    for words in (trial.static_words(), trial.static_words("none"), trial.dhcp_words(),
+                  ["hostname", "--hostname", "new-name"]):
         call = trial.call(*words)
         if call.printed:
             yield f"{' '.join(words)}: it has printed {call.printed[:80]!r}"
@@ -139,10 +159,10 @@ def takes_lease(trial):
     before = shown(trial.port)
 
     def has_lease():
-        return f"{LEASE}/24" in addresses_of(trial.port)
+        return addresses_of(trial.port) == [f"{LEASE}/24"]
 
     if not has_lease() and wait_until(has_lease, SETTLE_S):
-        yield f"when it returned, {trial.port} had {before}, and the lease only came later: wait for it"
+        yield f"when it returned, {trial.port} had {before}, and the lease alone only later: wait for it"
     elif not has_lease():
         yield f"{trial.port} has {before} instead of the lease {LEASE}/24"
     yield from dhcp_faults(trial)
@@ -227,7 +247,7 @@ def one_at_a_time(trial):
             yield f"{' '.join(call.words)}: it has not returned within {trial.limit} seconds"
     # With one port only, the second change replaces the first.
     for port, address in {trial.port: NEW, trial.other: OTHER_NEW}.items():
-        if addresses_of(port) != [f"{address}/24"] or address not in text_of("/etc/network/interfaces"):
+        if addresses_of(port) != [f"{address}/{PREFIX}"] or address not in text_of("/etc/network/interfaces"):
             yield f"when both should have returned, the change of {port} was not made"
 
 
@@ -305,21 +325,36 @@ def refuses(trial):
 
 
 def keeps_others(trial):
-    # The same for ifupdown, and harder to change.
-    interfaces = text_of("/etc/network/interfaces")
+    if meaning(trial.port) is None:
+        raise Skip("this machine has no ifupdown, which would say what the file means")
+    # Without empty lines it means the same, and is harder to change.
+    interfaces = re.sub(r"\n\s*\n", "\n", text_of("/etc/network/interfaces")) + PLANTED
     with open("/etc/network/interfaces", "w", encoding="utf-8", errors="surrogateescape") as file:
-        file.write(re.sub(r"\n\s*\n", "\n", interfaces))
-    others = set(re.findall(r"^\s*iface\s+(\S+)", interfaces, re.M)) - {trial.port}
-    before = {name: meaning(name) for name in sorted(others)}
+        file.write(interfaces)
+    with open(SOURCED, "w", encoding="ascii") as file:
+        file.write(f"iface {SOURCED_PORT} inet manual\n")
+    others = {SOURCED_PORT, *re.findall(r"^\s*iface\s+(\S+)", interfaces, re.M)} - {trial.port}
+    before = {name: settings_of(name) for name in sorted(others)}
+    at_boot = brought_up_at_boot()
+    other_before = meaning(trial.other)
     words = trial.static_words(dns=SERVERS)
     call = trial.call(*words)
     if call.status != "0":
         yield f"for a file without empty lines, {call.outcome}"
+    # Elsewhere something other than ifupdown may bring the ports up.
+    if trial.port in at_boot and NEVER_SET not in others:
+        far_end = f"v-{NEVER_SET}"
+        subprocess.run(["ip", "link", "add", NEVER_SET, "type", "veth", "peer", "name", far_end], check=False)
+        if trial.call(*trial.static_words(NEVER_SET_NEW, NEVER_SET, SERVERS)).status == "0":
+            at_boot.add(NEVER_SET)
     for name, settings_before in before.items():
-        if meaning(name) != settings_before:
-            yield f"{name} has lost its settings: they were {settings_before}, and are {meaning(name)}"
+        lost, new = settings_before - settings_of(name), settings_of(name) - settings_before
+        if lost or new:
+            yield f"{name} has lost {sorted(lost)}, and has got {sorted(new)}"
+    for name in sorted(at_boot - brought_up_at_boot()):
+        yield f"no line auto or allow-hotplug brings {name} up at boot"
     pages = [(trial.port, NEW)]
-    if before.get(trial.other):
+    if trial.other in before and other_before:
         subprocess.run(["ip", "addr", "flush", "dev", trial.other], check=False)
         subprocess.run(["ip", "addr", "add", f"{OTHER_NEW}/24", "dev", trial.other], check=False)
         pages.append((trial.other, OTHER_NEW))
@@ -328,9 +363,9 @@ def keeps_others(trial):
         yield f"the panel reads {read[0]['words'] or read[0]['shown']} instead of what was set"
     if len(read) > 1:
         other = without_servers(read[1]["words"] or [])
-        if other != before[trial.other]:
+        if other != other_before:
             shown_instead = other or read[1]["shown"]
-            yield f"{trial.other}: the panel reads {shown_instead} instead of {before[trial.other]}"
+            yield f"{trial.other}: the panel reads {shown_instead} instead of {other_before}"
 
 
 def replaces_files(trial):
@@ -360,7 +395,8 @@ def page_shows(trial):
 
 def reboots(trial):
     # As the program calls it.
-    subprocess.run(["sh", "-c", f"`{script.SCRIPT} hostname --hostname new-name` &"], check=False,
+    command = f"`{script.SCRIPT} hostname --hostname new-name` &"
+    subprocess.run([*script.AS_THE_SERVICE, "sh", "-c", command], check=False,
                    stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
     if not script.reboot_asked(trial.limit):
         yield "it has not asked for a reboot"
@@ -397,7 +433,8 @@ CHECKS = [
     Check("the script refuses bad arguments", refuses,
           "check every argument before the first change, and end with another status than 0"),
     Check("the script keeps the stanzas of other ports", keeps_others,
-          "replace only the port's own stanza, even without empty lines, and write one after each stanza"),
+          "replace only the port's own stanza, even without empty lines, write an empty line after each "
+          "stanza, and add a line auto for a port that has none"),
     Check("the script replaces files in one step", replaces_files,
           "write a new file beside the old one, and rename it"),
     Check("the panel shows the new address", page_shows,
@@ -412,6 +449,10 @@ def play(check, subject, limit):
     names = [name for name in subject.ports if name.startswith("eth")] or ["eth0"]
     port, other = names[0], names[:2][-1]
     stage = subject.stage.copy(subject.work)
+    # The commands are this machine's, and udhcpc may not be the DHCP client of the image.
+    if not os.path.isfile(f"{stage.directory}/{LEASE_SCRIPT}"):
+        with open(f"{os.path.dirname(BOX)}/appliance/{LEASE_SCRIPT}", encoding="ascii") as own:
+            stage.write(LEASE_SCRIPT, own.read(), 0o755)
     addresses = {**dict.fromkeys((port, other), "-"), **subject.ports}
     stage.write("links", "".join(f"{name} {address}{f' dhcp {DHCP_SERVER}/24' if name == port else ''}\n"
                                  for name, address in addresses.items()))

@@ -16,6 +16,21 @@ def is_ipv6(option, value):
     return ":" in value or option == "netmask" and value.isdigit()
 
 
+def steps_of_ifup(port):
+    said = ask("ifup", "--no-act", "--force", "--no-scripts", port)
+    return said.stdout + said.stderr
+
+
+def settings_of(port):
+    """All that the file says about a port, of whatever kind: its options, and what ifup would do."""
+    return set(filter(str.strip, (ask("ifquery", port).stdout + steps_of_ifup(port)).split("\n")))
+
+
+def brought_up_at_boot():
+    listed = (ask("ifquery", "--list", f"--allow={when}").stdout for when in ("auto", "hotplug"))
+    return set("".join(listed).split())
+
+
 def meaning(port):
     """The port's IPv4 settings as words of the configuration script, [] if it has none, or None
     without ifupdown. Others have an ifquery, too, which prints something else."""
@@ -30,6 +45,5 @@ def meaning(port):
     if "address" in values:
         words = ["--ipaddress", values["address"], "--netmask", values.get("netmask", "")]
         return words + (["--gateway", values["gateway"]] if "gateway" in values else [])
-    steps = ask("ifup", "--no-act", "--force", "--no-scripts", port)
-    takes_lease = re.search("udhcpc|dhclient|dhcpcd|pump|DHCP client", steps.stdout + steps.stderr)
+    takes_lease = re.search("udhcpc|dhclient|dhcpcd|pump|DHCP client", steps_of_ifup(port))
     return ["--dhcp"] if takes_lease else []

@@ -16,7 +16,7 @@ LINE = "/dev/ttyS1"
 TTY = "/run/panel-tty"
 RECORDED = "/run/recorded"
 RECORDER = f"#!/bin/sh\nprintf '%s\\0' \"$@\" >{RECORDED}.new\nmv {RECORDED}.new {RECORDED}.$(date +%s%N)\n"
-AS_THE_SERVICE = ("env", "--ignore-signal=USR1,HUP,PIPE", "LC_ALL=C")
+AS_THE_SERVICE = ("env", "--ignore-signal=USR1,HUP,PIPE", "--unset=HOME", "--unset=TERM", "LC_ALL=C")
 STEP_LIMIT_S = 60
 OTHER_PAGES = 5  # product, host name, connection, eth4 and eth5
 START_LIMIT_S = 20

@@ -24,11 +24,11 @@ esac
 exec {GATE}/NAME "$@"
 """
 REBOOT_ASKED = "/run/reboot-asked"
-# Stands in for each command that can reboot: the first two may be links to the third.
-REBOOTERS = ("/usr/sbin/reboot", "/usr/sbin/shutdown", "/usr/bin/systemctl")
+# Stands in for each command that can reboot: all of them may be links to the same two.
+REBOOTERS = ("/usr/sbin/reboot", "/usr/sbin/shutdown", "/usr/sbin/init", "/usr/bin/systemctl")
 REBOOT = f"""#!/bin/sh
 case "${{0##*/}} $*" in
-    reboot* | shutdown* | *" reboot"*) : >{REBOOT_ASKED} ;;
+    reboot* | shutdown*" -r"* | shutdown*" --reboot"* | "init 6" | systemctl*" reboot"*) : >{REBOOT_ASKED} ;;
     *) exit 1 ;; # there is no service manager
 esac
 """
