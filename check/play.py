@@ -6,6 +6,7 @@ import shutil
 import signal
 import subprocess
 import tempfile
+import threading
 
 HERE = os.path.dirname(os.path.realpath(__file__))
 BOX = os.path.join(os.path.dirname(HERE), "box", "kestrova-panel-box")
@@ -19,12 +20,19 @@ class NoBox(Exception):
 
 
 running = set()  # boxes
+ending = threading.Event()
 
 
 def end_all():
-    """Ends the boxes at once; whoever waits for one gets NoBox."""
+    """Ends the boxes at once, and lets no other begin; whoever waits for one gets NoBox."""
+    ending.set()
     for box in set(running):
         box.kill()
+
+
+def refuse_at_the_end():
+    if ending.is_set():
+        raise NoBox("the check has been ended")
 
 
 class Stage:
@@ -34,6 +42,7 @@ class Stage:
         self.directory = tempfile.mkdtemp(dir=work)
         self.left_out = appliance.copy_to(self.directory)
         kit = f"{self.directory}/{KIT}"
+        subprocess.run(["rm", "-rf", kit], check=True)  # that of the appliance
         shutil.copytree(HERE, kit, ignore=shutil.ignore_patterns("__pycache__"))
         for program in programs:
             shutil.copy(program, kit)
@@ -50,6 +59,7 @@ class Stage:
 
     def copy(self, work):
         """Another stage that begins as this one."""
+        refuse_at_the_end()
         other = object.__new__(Stage)
         other.directory = tempfile.mkdtemp(dir=work)
         other.left_out = self.left_out
@@ -58,10 +68,13 @@ class Stage:
 
     def run(self, *command):
         """Runs a command in a new box, and returns what it has printed."""
+        refuse_at_the_end()
         with subprocess.Popen([BOX, "--no-tty", "--appliance", self.directory, "--", *command],
                               stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, stderr=subprocess.PIPE,
                               encoding="utf-8", errors="surrogateescape") as box:
             running.add(box)
+            if ending.is_set():
+                box.kill()
             try:
                 said, complaint = box.communicate(timeout=MOST_SECONDS)
             except subprocess.TimeoutExpired:
