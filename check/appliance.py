@@ -9,6 +9,7 @@ import stat
 import subprocess
 import tarfile
 
+from checks import OWN_ADVICE
 from front.copies import Archive, check_host_name, open_regular
 from front.first_process import HOST_ETC
 from inside.ports import Ports
@@ -24,6 +25,10 @@ MOST_LINKS = 40  # that the kernel follows
 MOST_FOLDERS = 60  # one in the other
 MOST_TEXT_BYTES = 1 << 20
 MOST_COPIED_BYTES = 256 << 20
+
+KINDS = {stat.S_IFIFO: "FIFO", stat.S_IFDIR: "directory", stat.S_IFSOCK: "socket",
+         stat.S_IFLNK: "link that leads back to itself"}
+NOT_READABLE = f"cannot be read by this user{OWN_ADVICE}run the check as root"
 
 
 class Copy(Archive):
@@ -76,7 +81,8 @@ class Appliance:
         self.root = os.path.realpath(root)
         self.is_image = os.path.isdir(f"{self.root}/usr")
         own_links = f"{self.root}/links"
-        self.links = links or (own_links if os.path.isfile(own_links) else None)
+        self.links = links or (own_links if os.path.lexists(own_links) else None)
+        self.no_ports = []  # names in the interfaces file of which the box can make no ports, and why
 
     def place(self, name):
         """Where a path of the appliance lies here, its links followed as the appliance would."""
@@ -122,6 +128,14 @@ class Appliance:
             elif os.path.lexists(place):
                 yield name
 
+    def drop_ins(self, ending, *folders):
+        """The files with this ending in these folders, in the order of their names. Of those that have the
+        same name, only that of the first folder counts."""
+        found = {}
+        for file in self.files_below(*folders):
+            found.setdefault(os.path.basename(file), file)
+        return [found[name] for name in sorted(found) if name.endswith(ending)]
+
     def kind_fault(self, name):
         """Why the program would come to grief when it opens this file, or None."""
         place, inner = self.place(name), self.inner_place(name)
@@ -129,15 +143,16 @@ class Appliance:
             return f"leads to {inner}, which may have no end"
         try:
             status = os.lstat(place)
+        except PermissionError:
+            return NOT_READABLE
         except OSError:
             return None
         if not stat.S_ISREG(status.st_mode):
-            return "is a " + {stat.S_IFIFO: "FIFO", stat.S_IFDIR: "directory", stat.S_IFSOCK: "socket"}.get(
-                stat.S_IFMT(status.st_mode), "device")
+            return "is a " + KINDS.get(stat.S_IFMT(status.st_mode), "device")
         if status.st_size > MOST_TEXT_BYTES:
             return f"has {status.st_size} bytes"
         if not os.access(place, os.R_OK):
-            return "cannot be read by this user: run the check as root"
+            return NOT_READABLE
         return None
 
     def host_name_fault(self):
@@ -151,9 +166,11 @@ class Appliance:
         return None
 
     def ports(self):
-        """The ports with their addresses or "-", as `links` lists them or, without it, those that
-        the interfaces file names. Raises ValueError if the box could not make them."""
+        """The ports with their addresses or "-", as `links` lists them or, without it, those that the
+        interfaces file names and the box can make. Raises ValueError if `links` cannot be used."""
         if self.links:
+            if not os.path.isfile(self.links):
+                raise ValueError(f"{self.links} is not an ordinary file")
             Ports(self.links)
             with open(self.links, encoding="latin-1") as links:
                 words = [line.split() for line in links]
@@ -161,7 +178,15 @@ class Appliance:
         names = []
         for file in self.files_below(INTERFACES, "etc/network/interfaces.d"):
             names += re.findall(r"^\s*iface\s+(\S+)", self.text(file), re.M)
-        return {name: "-" for name in sorted(set(names) - {"lo"})}
+        box, found = Ports(os.devnull), {}
+        self.no_ports = []
+        for name in sorted(set(names) - {"lo"}):
+            try:
+                box.add(name, "-", None, None)
+                found[name] = "-"
+            except ValueError as fault:  # for an alias, for example
+                self.no_ports.append(str(fault))
+        return found
 
     def copy_to(self, directory):
         """Copies what the box needs, and returns what has been left out."""
@@ -178,6 +203,7 @@ class Appliance:
         # The tools in the box are the host's, and look things up in these.
         unwanted = list(HOST_ETC) if self.is_image else []
         unwanted += ["hostname"] if self.host_name_fault() else []
+        unwanted += [] if os.path.isdir(self.place("etc/network")) else ["network"]  # which the box makes
         for name in unwanted:
             subprocess.run(["rm", "-rf", f"{directory}/etc/{name}"], check=True)
         return copy.left_out

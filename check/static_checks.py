@@ -5,6 +5,7 @@ shows it, and ifupdown says what the interfaces file means.
 """
 
 import concurrent.futures
+import fnmatch
 import functools
 import ipaddress
 import os
@@ -13,12 +14,10 @@ import shutil
 import subprocess
 
 from appliance import HOST_NAME, INTERFACES, MODEL, READ_FILES, RESOLVER, SCRIPT
-from checks import Check, Skip
-from in_box.panel import without_servers
+from checks import OWN_ADVICE, Check, Skip
+from in_box.panel import OTHER_PAGES, without_servers
 from play import Stage
 
-ALWAYS_LISTED = 2  # the program lists eth4 and eth5 in any case
-FIXED_PAGES = 3
 ROW_LENGTH = 16
 MOST_LISTED_SERVERS = 10
 PORT_ADDRESS = "192.0.2.200"  # by which a port's page is found
@@ -28,14 +27,35 @@ IMAGE_LIMIT_S = 20
 BOOT_FILES = ("boot/grub/grub.cfg", "boot/cmdline.txt", "boot/firmware/cmdline.txt",
               "boot/extlinux/extlinux.conf", "boot/loader/entries")
 UNIT_FOLDERS = ("usr/lib/systemd/system", "lib/systemd/system", "usr/local/lib/systemd/system")
-USES_LINE = re.compile(r"^(?!\s*[#;]).*(ttyS1\b|serial .*--unit=1\b).*", re.M)
-TOOLS = "stty ifconfig hostname awk sed grep egrep sort tr head cat env kill"
+# A boot loader and the kernel can also be told the usual address of the second serial port. What waits for
+# the device, or only gives it a mode, does not use it.
+USES_LINE = re.compile(
+    r"^(?!\s*([#;]|(Condition|Assert|Description)\w*=)).*((?<!dev-)ttyS1\b|serial .*--unit[= ]1\b|"
+    r"(console|earlycon|earlyprintk|serial)\b.*0x0*2f8\b).*", re.M | re.I)
+RULE_USES_LINE = re.compile(r"^(?!\s*#|.*kestrova-panel).*ttyS1\b.*(RUN|SYSTEMD_WANTS).*", re.M)
+SYSCTL_FILES = ("etc/sysctl.d", "usr/local/lib/sysctl.d", "usr/lib/sysctl.d", "lib/sysctl.d",
+                "etc/sysctl.conf")
+IPV6_SETTING = re.compile(r"^\s*-?net[./]ipv6[./]conf[./](\S+)[./]disable_ipv6\s*=\s*(\d+)", re.M)
+IPV6_OFF = re.compile(r"^(?!\s*[#;]).*(\bipv6\.disable(_ipv6)?=1|\bipv6 .*\bdisable(_ipv6)?=1|"
+                      r"sysctl\s.*disable_ipv6=1|addrgenmode\s+none)", re.M)
+# By these two together, which systemd brings, a port gets another name than the kernel's.
+RENAMING = (("udev/rules.d", "80-net-setup-link.rules", "net_setup_link"),
+            ("systemd/network", "99-default.link", r"^\s*NamePolicy\s*=.*(onboard|slot|path|mac)"))
+# In an own .link file. One without this leaves its ports the kernel's names, or names them eth0 and so on.
+OTHER_NAME = re.compile(r"^\s*(Name\s*=(?!\s*eth)|NamePolicy\s*=.*(onboard|slot|path|mac))", re.M)
+NAMES_ETH = re.compile(
+    r"^(?!\s*[#;]).*(\bnet\.ifnames=0|\bNAME:?=\"eth|(?<![\w-])name\s+eth\d|\bset-name:\s*eth|"
+    r"\brename\s.*=eth)|^\[Link\]\s*\n((?!\[).*\n)*\s*Name\s*=\s*eth", re.M)
+NAMED_IN = ("etc", "boot", "efi", "usr/lib/kernel", "usr/lib/udev/rules.d", "usr/lib/systemd/network",
+            *UNIT_FOLDERS, "usr/local", "opt")
+TOOLS = "stty ifconfig hostname awk sed grep egrep sort tr head cat env /bin/kill"  # kill is built in, too
 TRY_SHELL = f"""echo "1\\n2"
 for tool in {TOOLS}; do [ -n "$(command -v $tool)" ] || echo "missing $tool"; done"""
 
 STANZA_WORD = r"(?:iface|auto|allow-|mapping|source|no-auto-down|no-scripts)"
 # What in a port's stanza makes the program read it otherwise than ifupdown, and how to say so.
 CAUSES = [
+    (r"\r$", "a line ends with a carriage return: remove it"),
     (r"^iface\s+{port}\s+inet6", "an inet6 stanza comes first: put the inet stanza before it"),
     (r"^[ \t]+iface\s+{port}\s", "there is a blank before iface: begin the line with iface"),
     (r"^iface(?=\s+{port}\s)(?! {port} inet[ \t])", "the iface line has a tab or more than one space"),
@@ -45,8 +65,9 @@ CAUSES = [
     (r"^\s*(address|netmask|gateway)[ ]*\t", "there is a tab before a value: use a space"),
     (r"^\s*(address|netmask|gateway).*[ \t]$", "there is a blank at the end of a line: remove it"),
     (r"^\s*address\s+\S+/[0-9]+", "the address has a prefix length: write a netmask line"),
-    (r"^\s*(?!address|netmask|gateway)\S*(address|netmask|gateway)",
-     "another word contains address, netmask or gateway, and is read as that: put its line above these"),
+    (r"^\s*netmask\s+[0-9]+$", "the netmask is a number of bits: write it like 255.255.255.0"),
+    (r"^\s*(?!address|netmask|gateway)\S.*(address|netmask|gateway)",
+     "another line contains address, netmask or gateway, and is read as that: put it above these"),
     (r"\\$", "a line goes on in the next one: write it as one line"),
     (rf"^iface\s+{{port}}\s.*\n(.*\S.*\n)*[ \t]*{STANZA_WORD}",
      "no empty line follows the stanza: the next one is read as part of it"),
@@ -82,7 +103,7 @@ class Subject:
 
     def left_out(self):
         """What is in none of the boxes, each with the reason."""
-        return self.stage.left_out if "stage" in vars(self) else []
+        return self.appliance.no_ports + (self.stage.left_out if "stage" in vars(self) else [])
 
     def settings_of(self, port):
         alone = self.stage.copy(self.work)
@@ -94,7 +115,7 @@ class Subject:
     def played(self):
         """All pages, and the settings of each port that has some; the boxes are there at the same time."""
         settable = [port for port in self.ports if port.startswith("eth")]
-        count = FIXED_PAGES + ALWAYS_LISTED + len(self.ports)
+        count = OTHER_PAGES + len(self.ports)
         with concurrent.futures.ThreadPoolExecutor(1 + len(settable)) as pool:
             shown = pool.submit(self.stage.ask, "pages", count=count)
             read = {port: pool.submit(self.settings_of, port) for port in settable}
@@ -111,26 +132,34 @@ class Subject:
         return self.played[1]
 
 
+def has_command(appliance, name):
+    """Whether the image or, where there is no image, this machine has it."""
+    places = [name] if "/" in name else [f"{folder}/{name}" for folder in IMAGE_PATH.split(":")]
+    return any(map(appliance.exists if appliance.is_image else os.path.exists, places))
+
+
 def script(subject):
     appliance, place = subject.appliance, subject.appliance.place(SCRIPT)
+    fault = appliance.kind_fault(SCRIPT)
+    if fault:
+        yield f"/{SCRIPT} {fault}"
+        return
     if not os.path.exists(place):
         folder = os.path.dirname(place)
         beside = " ".join(sorted(os.listdir(folder))) if os.path.isdir(folder) else ""
         yield f"/{SCRIPT} is missing" + (f"; beside its place there is: {beside}" if beside else "")
         return
-    fault = appliance.kind_fault(SCRIPT)
-    if fault:
-        yield f"/{SCRIPT} {fault}"
-        return
     if not os.stat(place).st_mode & 0o100:
         yield f"/{SCRIPT} is not executable"
     first = appliance.text(SCRIPT).partition("\n")[0]
     interpreter = re.match(r"#!\s*([^ \t]+)", first)
+    by_env = re.match(r"#!\s*\S*/env\s+(?:-S\s*)?([^\s=-]+)(?=\s|$)", first)
     if not interpreter and not appliance.text(SCRIPT).startswith("\x7fELF"):
         yield f"/{SCRIPT} does not begin with #! and an interpreter"
-    elif interpreter and not (appliance.exists(interpreter[1][1:]) if appliance.is_image
-                              else os.path.exists(interpreter[1])):
+    elif interpreter and not has_command(appliance, interpreter[1]):
         yield f"its interpreter {interpreter[1]!r} does not exist"
+    elif by_env and not has_command(appliance, by_env[1]):
+        yield f"its interpreter {by_env[1]!r} is not in PATH"
     elif first.endswith("\r"):
         yield "its first line ends with a carriage return"
 
@@ -159,7 +188,8 @@ def ports(subject):
 def model(subject):
     if not any(subject.pages[0]):
         first = subject.appliance.text(MODEL).partition("\n")[0]
-        yield f"the product page is blank: /{MODEL} begins with {first!r}"
+        fault = subject.appliance.kind_fault(MODEL)
+        yield f"the product page is blank: /{MODEL} {fault or f'begins with {first!r}'}"
 
 
 def label_of(subject, name):
@@ -209,6 +239,11 @@ def interfaces(subject):
     for port, answer in subject.settings.items():
         if answer["meaning"] is None:
             raise Skip("there is no ifquery of ifupdown: run apt-get install ifupdown")
+        if answer["complaint"]:
+            yield f"{port}: ifupdown refuses it: {answer['complaint']}"
+            if INTERFACES in answer["complaint"]:
+                return  # it refuses the whole file, and so every port
+            continue
         read = without_servers(answer["panel"]["words"] or [])
         if read != answer["meaning"]:
             shown = " ".join(read) or answer["panel"]["shown"]
@@ -251,10 +286,15 @@ def resolver(subject):
 def shell(subject):
     """The image's own shell, or, where there is no image, the one that the box has from this machine."""
     if subject.appliance.is_image:
-        done = subprocess.run(
-            ["bwrap", "--ro-bind", subject.appliance.root, "/", "--unshare-all",
-             "--clearenv", "--setenv", "PATH", IMAGE_PATH, "/bin/sh", "-c", TRY_SHELL],
-            stdin=subprocess.DEVNULL, capture_output=True, text=True, errors="replace", timeout=IMAGE_LIMIT_S)
+        try:
+            done = subprocess.run(
+                ["bwrap", "--ro-bind", subject.appliance.root, "/", "--unshare-all", "--die-with-parent",
+                 "--clearenv", "--setenv", "PATH", IMAGE_PATH, "/bin/sh", "-c", TRY_SHELL],
+                stdin=subprocess.DEVNULL, capture_output=True, text=True, errors="replace",
+                timeout=IMAGE_LIMIT_S)
+        except subprocess.TimeoutExpired:
+            yield f"the image's /bin/sh has not ended within {IMAGE_LIMIT_S} seconds"
+            return
         if done.returncode != 0:
             raise Skip(f"the image's shell cannot be run here: {done.stderr.strip()}")
         said = done.stdout
@@ -271,39 +311,71 @@ def image_only(subject):
         raise Skip("only the root of an image can tell")
 
 
+def naming(subject):
+    image_only(subject)
+    appliance = subject.appliance
+    for folder, name, how in RENAMING:
+        # With a link to /dev/null in the first folder, nothing is found.
+        files = appliance.drop_ins(name, f"etc/{folder}", f"usr/lib/{folder}", f"lib/{folder}")
+        if not any(re.search(how, appliance.text(file), re.M) for file in files):
+            return
+    links = [file for file in appliance.files_below("etc/systemd/network") if ".link" in file]
+    named = [port for port in subject.ports if re.fullmatch("eth[^.:]*", port)]
+    if named and all(OTHER_NAME.search(appliance.text(file)) for file in links) and \
+            not any(NAMES_ETH.search(appliance.text(file)) for file in appliance.files_below(*NAMED_IN)):
+        yield f"nothing in the image gives the ports {' '.join(named)} these names: Debian names ports by " \
+              "their places, such as enp3s0"
+
+
+def ipv6_left_on(subject):
+    """The ports for which no sysctl file switches IPv6 off."""
+    off = dict.fromkeys(["default", *subject.ports])
+    for file in subject.appliance.drop_ins(".conf", *SYSCTL_FILES):
+        for ports, value in IPV6_SETTING.findall(subject.appliance.text(file)):
+            for name in off:
+                if ports == "all" or fnmatch.fnmatchcase(name, ports.replace("/", ".")):
+                    off[name] = value
+    return [name for name in subject.ports or off if (off[name] or off["default"]) != "1"]
+
+
 def ipv6(subject):
     image_only(subject)
-    off = re.compile(r"^\s*-?net[./]ipv6[./]conf[./](all|default)[./]disable_ipv6\s*=\s*1|ipv6\.disable=1|"
-                     r"addrgenmode\s+none", re.M)
     texts = {file: subject.appliance.text(file)
-             for file in subject.appliance.files_below("etc", "usr/lib/sysctl.d", *BOOT_FILES)}
-    if any(map(off.search, texts.values())):
+             for file in subject.appliance.files_below("etc", *BOOT_FILES)}
+    left_on = ipv6_left_on(subject)
+    if not left_on or any(map(IPV6_OFF.search, texts.values())):
         return
     networks = {file: re.search(r"^\s*LinkLocalAddressing\s*=\s*(no|ipv4)", text, re.M)
                 for file, text in texts.items() if file.endswith(".network")}
     if not any(networks.values()):
-        yield "nothing switches IPv6 off: a port without an IPv4 address would show one that begins with fe80"
+        yield f"nothing switches IPv6 off for {' '.join(left_on)}: without an IPv4 address, a port would " \
+              "show one that begins with fe80"
         return
     for file, is_off in networks.items():
         if not is_off:
             yield f"/{file} leaves IPv6 on: write LinkLocalAddressing=no there, too"
 
 
+def is_kept_away(appliance, unit):
+    """Whether the service manager never starts this unit: it is masked, or the package has seen to it."""
+    return any(appliance.exists(f"{folder}/{unit}.d/kestrova-panel.conf") for folder in UNIT_FOLDERS) or \
+        appliance.inner_place(f"etc/systemd/system/{unit}") == "/dev/null"
+
+
 def serial_line(subject):
     image_only(subject)
-    kept_away = any(subject.appliance.exists(f"{folder}/serial-getty@ttyS1.service.d/kestrova-panel.conf")
-                    for folder in UNIT_FOLDERS)
+    appliance = subject.appliance
     seen = set()
-    for file in subject.appliance.files_below("etc", *UNIT_FOLDERS, *BOOT_FILES):
-        place = subject.appliance.place(file)
+    for file in appliance.files_below("etc", *UNIT_FOLDERS, *BOOT_FILES):
+        place, unit = appliance.place(file), os.path.basename(file)
         if "kestrova-panel" in file or file == "etc/securetty":
             continue
-        if os.path.basename(file) == "serial-getty@ttyS1.service":
-            if not kept_away:
+        if re.fullmatch(r"[\w-]*getty@ttyS1\.service", unit):
+            if not is_kept_away(appliance, unit):
                 yield f"/{file} starts a login prompt on the line"
         elif place not in seen:
             seen.add(place)
-            uses = USES_LINE.search(subject.appliance.text(file))
+            uses = (RULE_USES_LINE if file.endswith(".rules") else USES_LINE).search(appliance.text(file))
             if uses:
                 yield f"/{file} uses the line: {uses[0].strip()}"
 
@@ -317,8 +389,11 @@ def service(subject):
     done = subprocess.run(
         ["systemctl", f"--root={subject.appliance.root}", "is-enabled", "kestrova-panel.service"],
         stdin=subprocess.DEVNULL, capture_output=True, text=True, timeout=IMAGE_LIMIT_S)
-    if done.stdout.strip() != "enabled":
-        yield f"kestrova-panel.service is {done.stdout.strip() or done.stderr.strip()}"
+    state = done.stdout.strip()
+    if state == "masked":
+        yield f"kestrova-panel.service is masked{OWN_ADVICE}run systemctl --root=IMAGE unmask kestrova-panel"
+    elif state != "enabled":
+        yield f"kestrova-panel.service is {state}" if state else done.stderr.strip()
 
 
 CHECKS = [
@@ -339,6 +414,8 @@ CHECKS = [
           f"list up to ten servers by their IPv4 addresses in /{RESOLVER}, and none of the appliance itself"),
     Check("the shell and the commands are those that the program needs", shell,
           "make dash the /bin/sh, and install net-tools, hostname, mawk, sed, grep, coreutils and procps"),
+    Check("the ports get the names that the files use", naming,
+          "put net.ifnames=0 on the kernel's command line, or name the ports by .link files"),
     Check("IPv6 is off", ipv6, "set net.ipv6.conf.all.disable_ipv6 = 1 in a file in /etc/sysctl.d"),
     Check("nothing else uses the serial line", serial_line,
           "give the login prompts, the kernel's console and other programs another line"),

@@ -11,7 +11,7 @@ import sys
 sys.path.append(os.path.dirname(os.path.dirname(os.path.realpath(__file__))))
 
 import live_checks
-from in_box.meaning import meaning
+from in_box.meaning import complaint, meaning
 from in_box.panel import pages, settings
 
 
@@ -24,9 +24,16 @@ def live(name, trial):
         return {"skip": str(reason)}
 
 
+def read(port, address):
+    """How the panel and ifupdown read a port's settings."""
+    means = meaning(port)
+    return {"panel": settings([(port, address)])[0], "meaning": means,
+            "complaint": "" if means is None else complaint(port)}
+
+
 QUESTIONS = {
     "pages": pages,
-    "settings": lambda port, address: {"panel": settings([(port, address)])[0], "meaning": meaning(port)},
+    "settings": read,
     "live": live,
 }
 

@@ -1,10 +1,12 @@
 """What the interfaces file means to ifupdown, which is asked by its own tools."""
 
+import ipaddress
 import re
 import shutil
 import subprocess
 
 INTERFACES = "/etc/network/interfaces"
+IPV4_BITS = 32
 
 
 def ask(*command):
@@ -13,7 +15,14 @@ def ask(*command):
 
 
 def is_ipv6(option, value):
-    return ":" in value or option == "netmask" and value.isdigit()
+    return ":" in value or option == "netmask" and value.isdigit() and int(value) > IPV4_BITS
+
+
+def complaint(port):
+    """Why ifupdown cannot bring the port up by its stanza, or "". That there is none is no fault."""
+    refused = re.search(r"^ifup: (.*)\nifup: (?:couldn't read|missing required configuration)",
+                        ask("ifup", "--no-act", "--force", "--no-scripts", port).stderr, re.M)
+    return refused[1] if refused else ""
 
 
 def steps_of_ifup(port):
@@ -43,7 +52,10 @@ def meaning(port):
         if not is_ipv6(option, value):
             values[option] = value
     if "address" in values:
-        words = ["--ipaddress", values["address"], "--netmask", values.get("netmask", "")]
+        netmask = values.get("netmask", "")
+        if netmask.isdigit():
+            netmask = str(ipaddress.ip_network(f"0.0.0.0/{netmask}").netmask)
+        words = ["--ipaddress", values["address"], "--netmask", netmask]
         return words + (["--gateway", values["gateway"]] if "gateway" in values else [])
     takes_lease = re.search("udhcpc|dhclient|dhcpcd|pump|DHCP client", steps_of_ifup(port))
     return ["--dhcp"] if takes_lease else []

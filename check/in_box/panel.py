@@ -96,7 +96,7 @@ def recorded():
     calls = []
     for name in sorted(os.listdir("/run")):
         if re.fullmatch(r"recorded\.[0-9]+", name):
-            with open(f"/run/{name}", encoding="utf-8", errors="surrogateescape") as words:
+            with open(f"/run/{name}", encoding="utf-8", errors="surrogateescape", newline="") as words:
                 calls.append(words.read().split("\0")[:-1])
     return calls
 

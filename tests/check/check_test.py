@@ -5,13 +5,16 @@ it, what is installed is tested.
 """
 
 import concurrent.futures
+import os
 import re
 import shutil
+import signal
 import subprocess
 import sys
 import tempfile
 import unittest
 from pathlib import Path
+from subprocess import PIPE, Popen
 
 ROOT = Path(__file__).resolve().parents[2]
 CHECK = ["kestrova-appliance-check"]
@@ -21,7 +24,8 @@ SCRIPT = "opt/kestrova/scripts/ezio/apply.py"
 
 # An image is an appliance with these. The commands need not work, because the check only looks for them.
 IMAGE = r"""
-mkdir -p usr/bin usr/lib/systemd/system etc/sysctl.d etc/systemd/system/dev-ttyS1.device.wants tmp
+mkdir -p usr/bin usr/lib/systemd/system etc/sysctl.d etc/systemd/system/dev-ttyS1.device.wants tmp \
+    usr/lib/systemd/network usr/lib/udev/rules.d etc/udev/rules.d etc/default boot/grub
 ln -s usr/bin bin; ln -s usr/lib lib; touch usr/lib/systemd/systemd
 for tool in stty ifconfig hostname awk sed grep egrep sort tr head cat env kill; do
     printf '#!/bin/sh\n' >bin/$tool; chmod +x bin/$tool; done
@@ -29,7 +33,14 @@ cp --parents -L $(ldd /bin/bash /bin/dash | grep -oE '/[^ :]+' | sort -u) /bin/d
 cp /usr/bin/python3 bin/python3; cp /bin/dash bin/sh
 printf '[Install]\nWantedBy=dev-ttyS1.device\n' >lib/systemd/system/kestrova-panel.service
 ln -s /usr/lib/systemd/system/kestrova-panel.service etc/systemd/system/dev-ttyS1.device.wants/
-echo net.ipv6.conf.all.disable_ipv6 = 1 >etc/sysctl.d/panel.conf
+for port in eth0 eth1 eth2 eth5 bridge0; do
+    echo net.ipv6.conf.$port.disable_ipv6 = 1; done >etc/sysctl.d/6.conf
+echo NamePolicy=keep kernel path >usr/lib/systemd/network/99-default.link
+echo 'IMPORT{builtin}="net_setup_link"' >usr/lib/udev/rules.d/80-net-setup-link.rules
+echo 'GRUB_CMDLINE_LINUX="quiet net.ifnames=0"' >etc/default/grub
+echo 'KERNEL=="ttyS1", GROUP="dialout"' >etc/udev/rules.d/line.rules
+echo After=dev-ttyS1.device >etc/systemd/system/helper.service
+ln -s /dev/null etc/systemd/system/serial-getty@ttyS1.service
 """
 # Stanzas of the ports eth0, eth1 and so on, one directly behind the other, and what is wrong with each.
 GOOD = "iface PORT inet static\n  address ADDRESS\n  netmask 255.255.255.0\n\n"
@@ -46,7 +57,10 @@ STANZAS = [
     (GOOD.replace("ADDRESS", "ADDRESS "), "blank at the end of a line"),
     (GOOD.replace("ADDRESS", "ADDRESS/24"), "prefix length"),
     ("iface PORT inet static\n  address ADDRESS\n\n", "no netmask"),
-    (GOOD.replace("\n\n", "\n  hwaddress ether 02:00:00:00:00:01\n\n"), "another word"),
+    (GOOD.replace("\n\n", "\n  hwaddress ether 02:00:00:00:00:01\n\n"), "another line"),
+    (GOOD.replace("\n\n", "\n  up route add 10.1.1.1 netmask 255.255.255.255 lo\n\n"), "another line"),
+    (GOOD.replace("255.255.255.0", "24"), "number of bits"),
+    (GOOD.replace("\n", "\r\n"), "carriage return"),
     (GOOD.replace("ADDRESS", "\\\n  ADDRESS"), "goes on in the next"),
     (GOOD.replace("\n\n", "\n \niface lo inet static\n  address 127.0.0.2\n\n"), "line of blanks"),
     ("source /etc/network/interfaces.d/*\n", "source line"),
@@ -61,29 +75,40 @@ APPLIANCES = [
     (f"chmod -x {SCRIPT}; sed -i '1s/$/\\r/' {SCRIPT}", "configuration script",
      ["not executable", r"python3\\r' does not"]),
     (f"rm {SCRIPT}; mkdir {SCRIPT}", "configuration script", ["is a directory"]),
+    (f"echo '#!/usr/bin/env python9' >{SCRIPT}", "configuration script", ["'python9' is not in PATH"]),
     ("rm etc/ma-platform; mkfifo etc/ma-platform; ln -sf /dev/zero etc/resolv.conf; cd opt/kestrova; rm seq*; "
-     "mkdir seq.site_conn; truncate -s 9G config/nis.config", "ordinary",
-     ["ma-platform is a FIFO", "resolv.conf leads to /dev/zero", "_conn is a directory", "9663676416 bytes"]),
+     "mkdir seq.site_conn; truncate -s 9G config/nis.config; ln -sf interfaces ../../etc/network", "ordinary",
+     ["ma-platform is a FIFO", "interfaces is a link that leads back",
+      "resolv.conf leads to /dev/zero", "_conn is a directory", "9663676416 bytes"]),
     ("echo two words >etc/hostname", "host name is", ["does not contain a host name"]),
     ("echo enp3s0 192.0.2.1/24 >links", "ports can", ["no port whose name begins with eth"]),
+    ("rm links; mkfifo links", "ports can", ["links is not an ordinary file"]),
     ("echo Q75 >etc/ma-platform", "model", ["begins with 'Q75'"]),
     ("for name in enp3s0 bridge2 eth10 eth9 eth0 eth0.7 evil0; do echo $name -; done >links", "label",
      ["enp3s0 has no page", "bridge2 has no label", "eth10 has the label E1", "eth9 has no label",
       "eth0 has the label E0", "eth0.7 has the label E0", "evil0 has no page"]),
     ("cp ../stanzas etc/network/interfaces; cp -R ../interfaces.d etc/network; cp ../links .", "settings",
      [f"eth{number}: the panel .*{cause}" for number, (_, cause) in enumerate(STANZAS) if cause]),
-    ("rm etc/network/interfaces", "settings", ["is missing or empty"]),
+    ("rm -r etc/network; ln -s nowhere etc/network; mkdir opt/appliance-check", "settings",
+     ["is missing or empty"]),
+    ("echo address 192.0.2.1 >etc/network/interfaces", "settings", ["ifupdown refuses it: .*misplaced"]),
+    ("printf 'iface eth1 inet static\\n' >etc/network/interfaces", "settings", ["eth1: .*variable: address"]),
     (SERVERS, "servers are", [r"nameserver\\t9.9.9.9' is not", "2001:db8::1 has an IPv6", "53 is a resolver",
                               "9.9.9.9 ' is not", "there are 12 servers", "the panel hands on"]),
     ("ln -sf ../run/systemd/resolve/stub-resolv.conf etc/resolv.conf", "servers are",
      ["resolver on the appliance"]),
-    (IMAGE + "cp /bin/bash bin/sh; rm bin/ifconfig", "shell", ["does not turn", "ifconfig is missing"]),
-    (IMAGE + "rm etc/sysctl.d/panel.conf", "IPv6", ["nothing switches IPv6 off"]),
-    (IMAGE + "mkdir etc/systemd/network; cd etc/systemd/network; touch 1.network; rm ../../sysctl.d/panel.conf;"
+    (IMAGE + "cp /bin/bash bin/sh; rm bin/ifconfig bin/kill", "shell",
+     ["does not turn", "ifconfig is missing", "kill is missing"]),
+    (IMAGE + "printf '#!/bin/dash\nwhile :; do :; done' >bin/sh", "shell", ["not ended within"]),
+    (IMAGE + "sed -i 's/^/#/' etc/default/grub", "get the names", ["ports eth0 eth1 eth2 eth5 these names"]),
+    (IMAGE + "echo net.ipv6.conf.eth1.disable_ipv6=0 >etc/sysctl.d/z.conf; touch etc/sysctl.d/z.conf.off;"
+     "echo '#ipv6.disable=1' >etc/default/grub", "IPv6", ["nothing switches IPv6 off for eth1:"]),
+    (IMAGE + "mkdir etc/systemd/network; cd etc/systemd/network; touch 1.network; rm ../../sysctl.d/6.conf;"
      "echo LinkLocalAddressing=no >2.network", "IPv6", ["1.network leaves IPv6 on"]),
-    (IMAGE + "mkdir etc/default etc/systemd/system/getty.target.wants; echo console=ttyS1 >etc/default/grub;"
-     "ln -s /dev/null etc/systemd/system/getty.target.wants/serial-getty@ttyS1.service", "serial",
-     ["default/grub uses the line", "starts a login prompt"]),
+    (IMAGE + "mkdir etc/systemd/system/getty.target.wants; echo console=ttyS1 >etc/default/grub;"
+     "echo serial --port=0x2f8 >boot/grub/grub.cfg; sed -i 's/GROUP/RUN+/' etc/udev/rules.d/line.rules;"
+     "ln -s /dev/null etc/systemd/system/getty.target.wants/getty@ttyS1.service", "serial",
+     ["default/grub uses the line", "grub.cfg uses", "line.rules uses", "starts a login prompt"]),
     (IMAGE + "rm -r etc/systemd/system/dev*", "service", ["kestrova-panel.service is disabled"]),
 ]
 
@@ -176,11 +201,24 @@ class Checked(unittest.TestCase):
 
     def test_appliances_without_faults(self):
         example = f"cp '{ROOT}/docs/examples/apply.sh' {SCRIPT}"
-        cases = [("stand-in", "true", "--live"),
+        alias = "rm links; printf '\\niface eth0:1 inet manual\\n' >>etc/network/interfaces"
+        cases = [("stand-in", "true", "--live"), ("alias", alias),
                  ("image", IMAGE + "rm -r links etc/udhcpc\n" + example, "--live")]
-        for (status, output), skipped in zip(self.at_once(cases), (3, 0)):
-            lines = re.findall("^ok", output, re.M)
-            self.assertEqual((status, len(lines), output.count("# SKIP")), (0, 31, skipped), output)
+        for (status, output), wanted in zip(self.at_once(cases), ((32, 4, 0), (13, 4, 1), (32, 0, 0))):
+            counts = tuple(len(re.findall(each, output, re.M)) for each in ("^ok", "# SKIP", "^# not played"))
+            self.assertEqual((status, counts), (0, wanted), output)
+
+    def test_ends_cleanly(self):
+        """Whoever ends the check early, it ends at once and leaves nothing behind."""
+        for ending, status, complaints in ((Popen.terminate, 128 + signal.SIGTERM, 0),
+                                           (lambda check: check.stdout.close(), 1, 1)):
+            with self.subTest(status=status), \
+                    Popen([*CHECK, "--live", ROOT / "box/appliance"], stdout=PIPE, stderr=PIPE,
+                          env={**os.environ, "TMPDIR": str(self.work)}) as check:
+                check.stdout.readline()
+                ending(check)
+                self.assertEqual((check.wait(10), check.stderr.read().count(b"\n")), (status, complaints))
+                self.assertEqual(list(self.work.iterdir()), [])
 
     def test_wrong_usage(self):
         appliance = ROOT / "box/appliance"
