@@ -94,7 +94,7 @@ class GivenUp(Exception):
 
 
 def faults_of(check, trial):
-    """The faults that a check finds. Those of a script that has refused all changes say nothing."""
+    """The faults that a check finds. That there are none says nothing of a script that refused all changes."""
     faults = []
     try:
         for fault in check.function(trial):

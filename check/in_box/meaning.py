@@ -18,16 +18,16 @@ def is_ipv6(option, value):
     return ":" in value or option == "netmask" and value.isdigit() and int(value) > IPV4_BITS
 
 
-def complaint(port):
-    """Why ifupdown cannot bring the port up by its stanza, or "". That there is none is no fault."""
-    refused = re.search(r"^ifup: (.*)\nifup: (?:couldn't read|missing required configuration)",
-                        ask("ifup", "--no-act", "--force", "--no-scripts", port).stderr, re.M)
-    return refused[1] if refused else ""
-
-
 def steps_of_ifup(port):
     said = ask("ifup", "--no-act", "--force", "--no-scripts", port)
     return said.stdout + said.stderr
+
+
+def complaint(port):
+    """Why ifupdown cannot bring the port up by its stanza, or "". That there is none is no fault."""
+    refused = re.search(r"^ifup: (.*)\nifup: (?:couldn't read|missing required configuration)",
+                        steps_of_ifup(port), re.M)
+    return refused[1] if refused else ""
 
 
 def settings_of(port):

@@ -97,7 +97,6 @@ class Limits(unittest.TestCase):
         self.assertEqual(self.panel.ask(self.panel.path + "journey")[0], 200)
         pages.pop().close()
         self.assert_well()
-        # Those that only wait for their next request make room, and those that read no answer do not.
         request = f"GET {self.panel.path}page.js HTTP/1.1\r\nHost: {self.panel.host}\r\n\r\n".encode()
         answers = b""
         with self.panel.connect() as hasty, contextlib.suppress(ConnectionError):
@@ -105,6 +104,7 @@ class Limits(unittest.TestCase):
             while more := hasty.recv(65536):
                 answers += more
         self.assertIn(answers.count(b"HTTP/1.1 200"), range(19, 21))  # in a second
+        # Those that only wait for their next request make room, and those that read no answer do not.
         quick = [self.panel.connect() for _ in range(64)]
         for connection in quick:
             connection.sendall(request)
