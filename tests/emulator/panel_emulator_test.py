@@ -56,8 +56,9 @@ class Terminal:
             if is_controlling:
                 fcntl.ioctl(0, termios.TIOCSCTTY, 0)
 
+        # Without --fast, a frame could be drawn between two characters of a word that a test waits for.
         self.process = subprocess.Popen(
-            [EMULATOR, *arguments, "--", "sh", "-c", command], stdin=other_end, stdout=other_end,
+            [EMULATOR, "--fast", *arguments, "--", "sh", "-c", command], stdin=other_end, stdout=other_end,
             stderr=other_end, env={**os.environ, "TERM": kind}, preexec_fn=take_terminal)
         os.close(other_end)
         self.shown = b""
