@@ -6,9 +6,9 @@ Nothing is written there, and nothing there is opened that could block or has no
 import os
 import re
 import stat
-import subprocess
 import tarfile
 
+import ending
 from checks import OWN_ADVICE
 from front.copies import Archive, check_host_name, open_regular
 from front.first_process import HOST_ETC
@@ -48,6 +48,7 @@ class Copy(Archive):
             super().add(name, kind, *details, **more)
 
     def add_file(self, path, name):
+        ending.go_on()
         try:
             size = os.stat(path).st_size
             if size > self.room:
@@ -71,7 +72,7 @@ class Copy(Archive):
         """Ends the copy and puts it there."""
         archive = self.finish()
         with open(archive, "rb") as file:
-            subprocess.run(["tar", "-xf", "-", "-C", directory], stdin=file, check=True)
+            ending.run_or_fail("tar", "-xf", "-", "-C", directory, stdin=file)
 
 
 class Appliance:
@@ -111,6 +112,7 @@ class Appliance:
 
     def text(self, name):
         """What is in an ordinary file, up to a mebibyte, or "" if there is none or it cannot be read."""
+        ending.go_on()
         try:
             with open_regular(self.place(name)) as file:
                 return os.fsdecode(file.read(MOST_TEXT_BYTES))
@@ -205,5 +207,5 @@ class Appliance:
         unwanted += ["hostname"] if self.host_name_fault() else []
         unwanted += [] if os.path.isdir(self.place("etc/network")) else ["network"]  # which the box makes
         for name in unwanted:
-            subprocess.run(["rm", "-rf", f"{directory}/etc/{name}"], check=True)
+            ending.run_or_fail("rm", "-rf", f"{directory}/etc/{name}")
         return copy.left_out

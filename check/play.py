@@ -6,7 +6,8 @@ import shutil
 import signal
 import subprocess
 import tempfile
-import threading
+
+import ending
 
 HERE = os.path.dirname(os.path.realpath(__file__))
 BOX = os.path.join(os.path.dirname(HERE), "box", "kestrova-panel-box")
@@ -19,22 +20,6 @@ class NoBox(Exception):
     """The box cannot be made, so that nothing can be played."""
 
 
-running = set()  # boxes
-ending = threading.Event()
-
-
-def end_all():
-    """Ends the boxes at once, and lets no other begin; whoever waits for one gets NoBox."""
-    ending.set()
-    for box in set(running):
-        box.kill()
-
-
-def refuse_at_the_end():
-    if ending.is_set():
-        raise NoBox("the check has been ended")
-
-
 class Stage:
     """A copy of the appliance with all that is played in it."""
 
@@ -42,7 +27,7 @@ class Stage:
         self.directory = tempfile.mkdtemp(dir=work)
         self.left_out = appliance.copy_to(self.directory)
         kit = f"{self.directory}/{KIT}"
-        subprocess.run(["rm", "-rf", kit], check=True)  # that of the appliance
+        ending.run_or_fail("rm", "-rf", kit)  # that of the appliance
         shutil.copytree(HERE, kit, ignore=shutil.ignore_patterns("__pycache__"))
         for program in programs:
             shutil.copy(program, kit)
@@ -59,7 +44,7 @@ class Stage:
 
     def copy(self, work):
         """Another stage that begins as this one."""
-        refuse_at_the_end()
+        ending.go_on()
         other = object.__new__(Stage)
         other.directory = tempfile.mkdtemp(dir=work)
         other.left_out = self.left_out
@@ -68,23 +53,13 @@ class Stage:
 
     def run(self, *command):
         """Runs a command in a new box, and returns what it has printed."""
-        refuse_at_the_end()
-        with subprocess.Popen([BOX, "--no-tty", "--appliance", self.directory, "--", *command],
-                              stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, stderr=subprocess.PIPE,
-                              encoding="utf-8", errors="surrogateescape") as box:
-            running.add(box)
-            if ending.is_set():
-                box.kill()
-            try:
-                said, complaint = box.communicate(timeout=MOST_SECONDS)
-            except subprocess.TimeoutExpired:
-                raise NoBox(f"a box has not ended within {MOST_SECONDS} seconds") from None
-            finally:
-                running.discard(box)
-                box.kill()
+        try:
+            box = ending.run([BOX, "--no-tty", "--appliance", self.directory, "--", *command], MOST_SECONDS)
+        except subprocess.TimeoutExpired:
+            raise NoBox(f"a box has not ended within {MOST_SECONDS} seconds") from None
         if box.returncode in (NO_BOX, -signal.SIGKILL):
-            raise NoBox(complaint.strip())
-        return said + (complaint if box.returncode != 0 else "")
+            raise NoBox(box.stderr.strip())
+        return box.stdout + (box.stderr if box.returncode != 0 else "")
 
     def ask(self, question, **details):
         """Has in_box/answer.py answer a question in a new box."""

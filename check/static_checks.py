@@ -13,6 +13,7 @@ import re
 import shutil
 import subprocess
 
+import ending
 from appliance import HOST_NAME, INTERFACES, MODEL, READ_FILES, RESOLVER, SCRIPT
 from checks import OWN_ADVICE, Check, Skip
 from in_box.panel import OTHER_PAGES, without_servers
@@ -287,11 +288,9 @@ def shell(subject):
     """The image's own shell, or, where there is no image, the one that the box has from this machine."""
     if subject.appliance.is_image:
         try:
-            done = subprocess.run(
+            done = ending.run(
                 ["bwrap", "--ro-bind", subject.appliance.root, "/", "--unshare-all", "--die-with-parent",
-                 "--clearenv", "--setenv", "PATH", IMAGE_PATH, "/bin/sh", "-c", TRY_SHELL],
-                stdin=subprocess.DEVNULL, capture_output=True, text=True, errors="replace",
-                timeout=IMAGE_LIMIT_S)
+                 "--clearenv", "--setenv", "PATH", IMAGE_PATH, "/bin/sh", "-c", TRY_SHELL], IMAGE_LIMIT_S)
         except subprocess.TimeoutExpired:
             yield f"the image's /bin/sh has not ended within {IMAGE_LIMIT_S} seconds"
             return
@@ -386,9 +385,8 @@ def service(subject):
         raise Skip("systemctl is missing: run apt-get install systemd")
     if not any(subject.appliance.exists(f"{folder}/systemd/systemd") for folder in ("usr/lib", "lib")):
         raise Skip("the image has no systemd")
-    done = subprocess.run(
-        ["systemctl", f"--root={subject.appliance.root}", "is-enabled", "kestrova-panel.service"],
-        stdin=subprocess.DEVNULL, capture_output=True, text=True, timeout=IMAGE_LIMIT_S)
+    done = ending.run(["systemctl", f"--root={subject.appliance.root}", "is-enabled", "kestrova-panel.service"],
+                      IMAGE_LIMIT_S)
     state = done.stdout.strip()
     if state == "masked":
         yield f"kestrova-panel.service is masked{OWN_ADVICE}run systemctl --root=IMAGE unmask kestrova-panel"
