@@ -156,12 +156,16 @@ class Checked(unittest.TestCase):
         self.work = Path(tempfile.mkdtemp())
         self.addCleanup(shutil.rmtree, self.work)
 
-    def check(self, name, change, *options):
-        """The status and the output for the project's own appliance, after a shell has changed it."""
+    def appliance(self, name, change):
+        """The project's own appliance, after a shell has changed it."""
         appliance = self.work / name
         shutil.copytree(ROOT / "box/appliance", appliance)
         subprocess.run(["sh", "-ec", change], cwd=appliance, check=True)
-        done = subprocess.run([*CHECK, *options, appliance], capture_output=True, text=True)
+        return appliance
+
+    def check(self, name, change, *options):
+        """The status and the output for a changed appliance."""
+        done = subprocess.run([*CHECK, *options, self.appliance(name, change)], capture_output=True, text=True)
         return done.returncode, done.stdout + done.stderr
 
     def at_once(self, cases):
@@ -209,16 +213,19 @@ class Checked(unittest.TestCase):
             self.assertEqual((status, counts), (0, wanted), output)
 
     def test_ends_cleanly(self):
-        """Whoever ends the check early, it ends at once and leaves nothing behind."""
+        """Whoever ends the check early, it leaves nothing behind and does not wait for the script."""
+        appliance = self.appliance("slow", f"printf '#!/bin/sh\nsleep 200\n' >{SCRIPT}")
+        left = self.work / "left"
+        left.mkdir()
         for ending, status, complaints in ((Popen.terminate, 128 + signal.SIGTERM, 0),
                                            (lambda check: check.stdout.close(), 1, 1)):
             with self.subTest(status=status), \
-                    Popen([*CHECK, "--live", ROOT / "box/appliance"], stdout=PIPE, stderr=PIPE,
-                          env={**os.environ, "TMPDIR": str(self.work)}) as check:
+                    Popen([*CHECK, "--live", "--limit", "200", appliance], stdout=PIPE, stderr=PIPE,
+                          env={**os.environ, "TMPDIR": str(left)}) as check:
                 check.stdout.readline()
                 ending(check)
-                self.assertEqual((check.wait(10), check.stderr.read().count(b"\n")), (status, complaints))
-                self.assertEqual(list(self.work.iterdir()), [])
+                self.assertEqual((check.wait(100), check.stderr.read().count(b"\n")), (status, complaints))
+                self.assertEqual(list(left.iterdir()), [])
 
     def test_wrong_usage(self):
         appliance = ROOT / "box/appliance"
